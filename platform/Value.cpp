@@ -1,0 +1,160 @@
+#include "platform/Value.h"
+
+#include <stdexcept>
+
+namespace corvane {
+
+namespace {
+struct KeyHash {
+  using is_transparent = void;
+  std::size_t operator()(std::string_view s) const noexcept { return std::hash<std::string_view>{}(s); }
+};
+}  // namespace
+
+struct Dictionary::Storage {
+  std::vector<Entry> entries;
+  std::unordered_map<std::string, std::size_t, KeyHash, std::equal_to<>> index;
+};
+
+struct Array::Storage {
+  std::vector<Value> elements;
+};
+
+// --- Dictionary ---------------------------------------------------------------
+
+Dictionary::Dictionary() : storage_(std::make_shared<Storage>()) {}
+
+std::size_t Dictionary::size() const { return storage_->entries.size(); }
+
+const Value* Dictionary::find(std::string_view key) const {
+  auto it = storage_->index.find(key);
+  return it == storage_->index.end() ? nullptr : &storage_->entries[it->second].second;
+}
+
+Value* Dictionary::findMutable(std::string_view key) const {
+  auto it = storage_->index.find(key);
+  return it == storage_->index.end() ? nullptr : &storage_->entries[it->second].second;
+}
+
+Value Dictionary::get(std::string_view key) const {
+  const Value* v = find(key);
+  return v ? *v : Value();
+}
+
+void Dictionary::set(std::string_view key, Value value) const {
+  if (Value* existing = findMutable(key)) {
+    *existing = std::move(value);
+    return;
+  }
+  storage_->index.emplace(std::string(key), storage_->entries.size());
+  storage_->entries.emplace_back(std::string(key), std::move(value));
+}
+
+bool Dictionary::remove(std::string_view key) const {
+  auto it = storage_->index.find(key);
+  if (it == storage_->index.end()) return false;
+  const std::size_t pos = it->second;
+  storage_->index.erase(it);
+  storage_->entries.erase(storage_->entries.begin() + static_cast<std::ptrdiff_t>(pos));
+  for (auto& [k, i] : storage_->index) {
+    if (i > pos) --i;
+  }
+  return true;
+}
+
+void Dictionary::clear() const {
+  storage_->entries.clear();
+  storage_->index.clear();
+}
+
+const std::vector<Dictionary::Entry>& Dictionary::entries() const { return storage_->entries; }
+
+Dictionary Dictionary::shallowCopy() const {
+  Dictionary copy;
+  *copy.storage_ = *storage_;
+  return copy;
+}
+
+Dictionary Dictionary::deepCopy() const {
+  Dictionary copy;
+  for (const auto& [key, value] : storage_->entries) copy.set(key, value.deepCopy());
+  return copy;
+}
+
+bool operator==(const Dictionary& a, const Dictionary& b) {
+  if (a.isSameObject(b)) return true;
+  return a.entries() == b.entries();
+}
+
+// --- Array --------------------------------------------------------------------
+
+Array::Array() : storage_(std::make_shared<Storage>()) {}
+
+Array::Array(std::vector<Value> elements) : storage_(std::make_shared<Storage>()) {
+  storage_->elements = std::move(elements);
+}
+
+std::size_t Array::size() const { return storage_->elements.size(); }
+
+const Value& Array::at(std::size_t index) const { return storage_->elements.at(index); }
+
+void Array::append(Value value) const { storage_->elements.push_back(std::move(value)); }
+
+void Array::insert(std::size_t index, Value value) const {
+  if (index > size()) throw std::out_of_range("Array::insert: index beyond the end");
+  storage_->elements.insert(storage_->elements.begin() + static_cast<std::ptrdiff_t>(index), std::move(value));
+}
+
+void Array::removeAt(std::size_t index) const {
+  if (index >= size()) throw std::out_of_range("Array::removeAt: index beyond the end");
+  storage_->elements.erase(storage_->elements.begin() + static_cast<std::ptrdiff_t>(index));
+}
+
+void Array::removeFirst(std::size_t count) const {
+  auto& e = storage_->elements;
+  e.erase(e.begin(), e.begin() + static_cast<std::ptrdiff_t>(std::min(count, e.size())));
+}
+
+void Array::clear() const { storage_->elements.clear(); }
+
+const std::vector<Value>& Array::elements() const { return storage_->elements; }
+
+Array Array::shallowCopy() const { return Array(storage_->elements); }
+
+Array Array::deepCopy() const {
+  Array copy;
+  for (const Value& v : storage_->elements) copy.append(v.deepCopy());
+  return copy;
+}
+
+bool operator==(const Array& a, const Array& b) {
+  if (a.isSameObject(b)) return true;
+  return a.elements() == b.elements();
+}
+
+// --- Value --------------------------------------------------------------------
+
+const char* Value::typeName(Type type) {
+  switch (type) {
+    case Type::Null: return "Null";
+    case Type::String: return "String";
+    case Type::Integer: return "Integer";
+    case Type::Real: return "Real";
+    case Type::Boolean: return "Boolean";
+    case Type::Date: return "Date";
+    case Type::Data: return "Data";
+    case Type::Dictionary: return "Dictionary";
+    case Type::Array: return "Array";
+  }
+  return "Unknown";
+}
+
+Value Value::deepCopy() const {
+  if (const Dictionary* d = asDictionary()) return Value(d->deepCopy());
+  if (const Array* a = asArray()) return Value(a->deepCopy());
+  return *this;
+}
+
+bool operator==(const Value& a, const Value& b) { return a.v_ == b.v_; }
+
+}  // namespace corvane

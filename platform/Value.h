@@ -1,0 +1,150 @@
+#pragma once
+
+// The property-list value model: strings, integers, reals, booleans, dates,
+// data, and the two containers. Dictionaries and arrays are shared mutable
+// objects: copying a Dictionary or Array handle gives a second holder of the
+// same container, and both see every change. Dictionaries keep insertion order.
+
+#include <cstddef>
+#include <cstdint>
+#include <functional>
+#include <memory>
+#include <string>
+#include <string_view>
+#include <unordered_map>
+#include <utility>
+#include <variant>
+#include <vector>
+
+namespace corvane {
+
+using Bytes = std::vector<std::uint8_t>;
+
+class Value;
+
+// A point in time with microsecond resolution, counted from 1970-01-01 00:00:00 UTC.
+struct Date {
+  std::int64_t microsecondsSince1970 = 0;
+  friend bool operator==(const Date&, const Date&) = default;
+};
+
+// Containers are handles with reference semantics, like a shared pointer: the
+// mutating operations are const because they change the shared container, not
+// the handle.
+class Dictionary {
+ public:
+  using Entry = std::pair<std::string, Value>;
+
+  Dictionary();  // a new, empty dictionary
+
+  std::size_t size() const;
+  bool empty() const { return size() == 0; }
+
+  // The value under the key, or nullptr when there is none.
+  const Value* find(std::string_view key) const;
+  Value* findMutable(std::string_view key) const;
+  // The value under the key, or a null value when there is none.
+  Value get(std::string_view key) const;
+  bool contains(std::string_view key) const { return find(key) != nullptr; }
+
+  // Replaces the value in place when the key exists, else appends the entry.
+  void set(std::string_view key, Value value) const;
+  bool remove(std::string_view key) const;
+  void clear() const;
+
+  // Entries in insertion order.
+  const std::vector<Entry>& entries() const;
+
+  // A new dictionary holding the same values (containers inside are shared).
+  Dictionary shallowCopy() const;
+  // A new dictionary in which every nested container is copied too.
+  Dictionary deepCopy() const;
+
+  bool isSameObject(const Dictionary& other) const { return storage_ == other.storage_; }
+  const void* identity() const { return storage_.get(); }
+
+ private:
+  struct Storage;
+  std::shared_ptr<Storage> storage_;
+};
+
+class Array {
+ public:
+  Array();  // a new, empty array
+  explicit Array(std::vector<Value> elements);
+
+  std::size_t size() const;
+  bool empty() const { return size() == 0; }
+  const Value& at(std::size_t index) const;  // throws std::out_of_range
+  void append(Value value) const;
+  void insert(std::size_t index, Value value) const;
+  void removeAt(std::size_t index) const;
+  void removeFirst(std::size_t count) const;  // removes min(count, size) leading elements
+  void clear() const;
+
+  const std::vector<Value>& elements() const;
+
+  Array shallowCopy() const;
+  Array deepCopy() const;
+
+  bool isSameObject(const Array& other) const { return storage_ == other.storage_; }
+  const void* identity() const { return storage_.get(); }
+
+ private:
+  struct Storage;
+  std::shared_ptr<Storage> storage_;
+};
+
+class Value {
+ public:
+  enum class Type { Null, String, Integer, Real, Boolean, Date, Data, Dictionary, Array };
+
+  Value() = default;  // the null value: "nothing"
+  Value(std::string s) : v_(std::move(s)) {}
+  Value(std::string_view s) : v_(std::string(s)) {}
+  Value(const char* s) : v_(std::string(s)) {}
+  Value(Dictionary d) : v_(std::move(d)) {}
+  Value(Array a) : v_(std::move(a)) {}
+  Value(corvane::Date d) : v_(d) {}
+  Value(Bytes b) : v_(std::move(b)) {}
+
+  // Numbers and booleans are made explicitly, so that a literal never picks
+  // the wrong kind by accident.
+  static Value integer(std::int64_t i) { Value v; v.v_ = i; return v; }
+  static Value real(double d) { Value v; v.v_ = d; return v; }
+  static Value boolean(bool b) { Value v; v.v_ = b; return v; }
+
+  Type type() const { return static_cast<Type>(v_.index()); }
+  bool isNull() const { return type() == Type::Null; }
+  bool isString() const { return type() == Type::String; }
+  bool isDictionary() const { return type() == Type::Dictionary; }
+  bool isArray() const { return type() == Type::Array; }
+
+  // Each returns nullptr when the value is of another type.
+  const std::string* asString() const { return std::get_if<std::string>(&v_); }
+  const std::int64_t* asInteger() const { return std::get_if<std::int64_t>(&v_); }
+  const double* asReal() const { return std::get_if<double>(&v_); }
+  const bool* asBoolean() const { return std::get_if<bool>(&v_); }
+  const corvane::Date* asDate() const { return std::get_if<corvane::Date>(&v_); }
+  const Bytes* asData() const { return std::get_if<Bytes>(&v_); }
+  const Dictionary* asDictionary() const { return std::get_if<Dictionary>(&v_); }
+  const Array* asArray() const { return std::get_if<Array>(&v_); }
+
+  // The class name shown in diagnostics: "String", "Integer", ...
+  const char* typeName() const { return typeName(type()); }
+  static const char* typeName(Type type);
+
+  // A copy in which nested containers are copied too (no sharing).
+  Value deepCopy() const;
+
+  // Structural equality: containers compare by contents, in order.
+  friend bool operator==(const Value& a, const Value& b);
+
+ private:
+  std::variant<std::monostate, std::string, std::int64_t, double, bool, corvane::Date, Bytes, Dictionary, Array> v_;
+};
+
+bool operator==(const Dictionary& a, const Dictionary& b);
+bool operator==(const Array& a, const Array& b);
+
+}  // namespace corvane

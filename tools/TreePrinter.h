@@ -1,0 +1,18 @@
+#pragma once
+
+// Printing a display tree: as an indented text tree (a row per node, "name: value"
+// for leaves) or as nested JSON objects {"name", "value"} / {"name", "children"}.
+
+#include <string>
+
+#include "model/CorvaneModelNode.h"
+
+namespace corvane::tools {
+
+enum class TreeFormat { Text, Json };
+
+std::string treeAsText(const CorvaneModelNode& root);
+std::string treeAsJson(const CorvaneModelNode& root);
+std::string formatTree(const CorvaneModelNode& root, TreeFormat format);
+
+}  // namespace corvane::tools

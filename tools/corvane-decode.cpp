@@ -1,0 +1,157 @@
+// corvane-decode: the offline decoder. Folds every packet of its inputs into one
+// generator and one state, in order, then prints the display tree once.
+
+#include <getopt.h>
+
+#include <cstdio>
+#include <cstring>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "LogGenerator/LogGenerator.h"
+#include "PacketInput.h"
+#include "TreePrinter.h"
+#include "model/CorvaneModelNode.h"
+#include "platform/Assertion.h"
+#include "platform/Log.h"
+#include "platform/LogChannelTechnology.h"
+#include "platform/Version.h"
+
+namespace {
+
+constexpr int kExitInput = 1;
+constexpr int kExitUsage = 2;
+constexpr int kExitAssertion = 3;
+
+constexpr const char* kUsage =
+    "Usage: corvane-decode --technology NAME [--format text|json] [--log] [FILE...]\n";
+
+void printHelp() {
+  std::printf(
+      "%s"
+      "\n"
+      "Decodes baseband log packets offline and prints the display tree.\n"
+      "\n"
+      "Each FILE (standard input when none is given, or for \"-\") is either a\n"
+      "property list (one packet), or text with one packet per line in hex, exactly\n"
+      "as the telephony service delivers it. Blanks and colons may stand between\n"
+      "bytes; blank lines and lines starting with # are skipped.\n"
+      "\n"
+      "Options:\n"
+      "  -t, --technology NAME  the log-channel technology: IFX, Quendra_GSM,\n"
+      "                         Quendra_CDMA, Quendra_LTE or Quendra_UTRAN2\n"
+      "  -f, --format FORMAT    text (an indented tree, the default) or json\n"
+      "  -l, --log              also write the decoders' system-log lines to\n"
+      "                         standard error as \"<priority> <text>\"\n"
+      "  -h, --help             show this help\n"
+      "  -V, --version          show the version\n"
+      "\n"
+      "Exit status: 0 on success, 1 for unreadable or malformed input, 2 for bad\n"
+      "usage, 3 when a decoder met data it asserts it never receives.\n",
+      kUsage);
+}
+
+int usageError(const std::string& message) {
+  std::fprintf(stderr, "corvane-decode: %s\n%s", message.c_str(), kUsage);
+  return kExitUsage;
+}
+
+bool isKnownTechnology(const std::string& name) {
+  for (auto t : corvane::kAllLogChannelTechnologies) {
+    if (t == name) return true;
+  }
+  return false;
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  using namespace corvane;
+
+  std::string technology;
+  std::string format = "text";
+  bool logToStderr = false;
+
+  static const option kOptions[] = {
+      {"technology", required_argument, nullptr, 't'},
+      {"format", required_argument, nullptr, 'f'},
+      {"log", no_argument, nullptr, 'l'},
+      {"help", no_argument, nullptr, 'h'},
+      {"version", no_argument, nullptr, 'V'},
+      {nullptr, 0, nullptr, 0},
+  };
+  opterr = 0;
+  for (;;) {
+    const int c = getopt_long(argc, argv, ":t:f:lhV", kOptions, nullptr);
+    if (c == -1) break;
+    switch (c) {
+      case 't': technology = optarg; break;
+      case 'f': format = optarg; break;
+      case 'l': logToStderr = true; break;
+      case 'h': printHelp(); return 0;
+      case 'V': std::printf("corvane-decode %s\n", kVersion); return 0;
+      case ':': return usageError(std::string("option ") + argv[optind - 1] + " needs a value");
+      default: return usageError(std::string("unknown option ") + argv[optind - 1]);
+    }
+  }
+  if (technology.empty()) return usageError("--technology NAME is required");
+  if (!isKnownTechnology(technology)) return usageError("unknown technology \"" + technology + "\"");
+  tools::TreeFormat treeFormat;
+  if (format == "text") {
+    treeFormat = tools::TreeFormat::Text;
+  } else if (format == "json") {
+    treeFormat = tools::TreeFormat::Json;
+  } else {
+    return usageError("unknown format \"" + format + "\" (text or json)");
+  }
+
+  std::vector<std::string> inputs(argv + optind, argv + argc);
+  if (inputs.empty()) inputs.emplace_back("-");
+
+  // Read everything first, so that bad input stops the run before any decoding.
+  std::vector<Bytes> packets;
+  for (const auto& path : inputs) {
+    tools::InputError error;
+    auto contents = tools::readInput(path, error);
+    if (!contents) {
+      std::fprintf(stderr, "corvane-decode: %s\n", error.message.c_str());
+      return kExitInput;
+    }
+    auto filePackets =
+        tools::packetsFromContents(*contents, path == "-" ? std::string("standard input") : path, error);
+    if (!filePackets) {
+      std::fprintf(stderr, "corvane-decode: %s\n", error.message.c_str());
+      return kExitInput;
+    }
+    for (auto& p : *filePackets) packets.push_back(std::move(p));
+  }
+
+  if (logToStderr) {
+    log::setSink(std::make_shared<log::TeeSink>(
+        std::vector<std::shared_ptr<log::Sink>>{log::sink(), std::make_shared<log::StderrSink>()}));
+  }
+
+  std::unique_ptr<LogGenerator> generator = LogGenerator::generatorFromTechnology(technology);
+  if (!generator) return usageError("no decoder for technology \"" + technology + "\" in this version");
+
+  try {
+    Dictionary state;
+    for (const auto& packet : packets) generator->updateState(state, packet);
+    const Value display = generator->generateLogUsingState(state);
+    PathDictionary paths;
+    const NodeRef root = CorvaneModelNode::makeTreeFromObject(display, paths);
+    const std::string text = tools::formatTree(*root, treeFormat);
+    std::fwrite(text.data(), 1, text.size(), stdout);
+  } catch (const AssertionFailure& failure) {
+    std::fflush(stdout);
+    std::fprintf(stderr, "corvane-decode: assertion failure in %s:%d: %s\n", failure.file().c_str(), failure.line(),
+                 failure.description().c_str());
+    return kExitAssertion;
+  }
+  if (std::fflush(stdout) != 0) {
+    std::fprintf(stderr, "corvane-decode: cannot write the output: %s\n", std::strerror(errno));
+    return kExitInput;
+  }
+  return 0;
+}
