@@ -1,0 +1,113 @@
+#include "platform/PropertyList.h"
+
+#include <gtest/gtest.h>
+
+#include "support/Values.h"
+
+namespace corvane {
+namespace {
+
+using test::A;
+using test::bytesOf;
+using test::D;
+using test::S;
+
+Value everyType() {
+  return D({
+      {"string", S("Serving Cell \xC3\xA9 <&>")},
+      {"empty string", S("")},
+      {"integer", Value::integer(62)},
+      {"negative", Value::integer(-140)},
+      {"large", Value::integer(INT64_C(1) << 40)},
+      {"real", Value::real(-97.25)},
+      {"true", Value::boolean(true)},
+      {"false", Value::boolean(false)},
+      {"date", Value(Date{INT64_C(1794816000) * 1000000})},
+      {"data", Value(Bytes{0x00, 0x81, 0xFF, 0x10})},
+      {"empty data", Value(Bytes{})},
+      {"array", A({S("a"), Value::integer(1), A({}), D({})})},
+      {"dict", D({{"z", S("last")}, {"a", S("first")}})},
+  });
+}
+
+class RoundTrip : public ::testing::TestWithParam<plist::Format> {};
+
+TEST_P(RoundTrip, EveryValueTypeSurvivesWritingAndReading) {
+  const Value original = everyType();
+  const Bytes written = plist::serializeOrThrow(original, GetParam());
+  EXPECT_EQ(plist::isBinary(written), GetParam() == plist::Format::Binary);
+  EXPECT_TRUE(plist::looksLikePropertyList(written));
+  const Value read = plist::parseOrThrow(written);
+  EXPECT_EQ(read, original);
+  // Order of dictionary keys is kept as written.
+  const auto& entries = read.asDictionary()->get("dict").asDictionary()->entries();
+  EXPECT_EQ(entries.front().first, "z");
+}
+
+INSTANTIATE_TEST_SUITE_P(PropertyList, RoundTrip, ::testing::Values(plist::Format::XML, plist::Format::Binary),
+                         [](const auto& p) { return p.param == plist::Format::XML ? "XML" : "Binary"; });
+
+TEST(PropertyList, ParsesAHandWrittenXmlPropertyList) {
+  const Bytes xml = bytesOf(
+      "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
+      "<plist version=\"1.0\"><dict><key>GetTechnology</key><string>IFX</string>"
+      "<key>n</key><integer>-5</integer></dict></plist>\n");
+  const Value v = plist::parseOrThrow(xml);
+  EXPECT_EQ(v, D({{"GetTechnology", S("IFX")}, {"n", Value::integer(-5)}}));
+}
+
+TEST(PropertyList, MalformedXmlIsAnErrorThatSaysSo) {
+  std::string error;
+  EXPECT_FALSE(plist::parse(bytesOf("<?xml version=\"1.0\"?><plist><dict><key>a</key>"), &error));
+  EXPECT_EQ(error, "malformed XML property list");
+}
+
+TEST(PropertyList, DataThatIsNoPropertyListIsAnErrorThatSaysSo) {
+  std::string error;
+  EXPECT_FALSE(plist::parse(bytesOf("hello world"), &error));
+  EXPECT_EQ(error, "data is neither an XML nor a binary property list");
+  EXPECT_FALSE(plist::parse(Bytes{}, &error));
+  EXPECT_EQ(error, "empty data is not a property list");
+  EXPECT_THROW(plist::parseOrThrow(bytesOf("\x01\x02")), plist::PropertyListError);
+}
+
+TEST(PropertyList, TruncatedBinaryIsAnError) {
+  const Bytes full = test::binaryBytes(everyType());
+  for (std::size_t cut : {std::size_t{8}, std::size_t{20}, full.size() / 2, full.size() - 1}) {
+    std::string error;
+    EXPECT_FALSE(plist::parse(std::span(full.data(), cut), &error)) << "cut at " << cut;
+    EXPECT_EQ(error, "malformed binary property list");
+  }
+}
+
+TEST(PropertyList, ANullValueCannotBeWritten) {
+  std::string error;
+  EXPECT_FALSE(plist::serialize(D({{"a", Value()}}), plist::Format::XML, &error));
+  EXPECT_EQ(error, "a null value cannot be written to a property list");
+  EXPECT_THROW(plist::serializeOrThrow(Value(), plist::Format::Binary), plist::PropertyListError);
+}
+
+TEST(PropertyList, NestingBeyondTheLimitIsRefusedOnReadAndWrite) {
+  std::string xml = "<?xml version=\"1.0\"?><plist>";
+  for (int i = 0; i < plist::kMaximumNesting + 2; ++i) xml += "<array>";
+  for (int i = 0; i < plist::kMaximumNesting + 2; ++i) xml += "</array>";
+  xml += "</plist>";
+  std::string error;
+  EXPECT_FALSE(plist::parse(bytesOf(xml), &error));
+  EXPECT_NE(error.find("nested more than"), std::string::npos) << error;
+
+  Value deep = A({});
+  for (int i = 0; i < plist::kMaximumNesting + 2; ++i) deep = Value(Array(std::vector<Value>{deep}));
+  EXPECT_FALSE(plist::serialize(deep, plist::Format::XML, &error));
+}
+
+TEST(PropertyList, RecognisesTheStartOfEitherForm) {
+  EXPECT_TRUE(plist::looksLikePropertyList(bytesOf("  \n<?xml version=\"1.0\"?>")));
+  EXPECT_TRUE(plist::looksLikePropertyList(bytesOf("<plist version=\"1.0\">")));
+  EXPECT_TRUE(plist::looksLikePropertyList(bytesOf("bplist00rest")));
+  EXPECT_FALSE(plist::looksLikePropertyList(bytesOf("01 02 03")));
+  EXPECT_FALSE(plist::looksLikePropertyList(bytesOf("bplist")));
+}
+
+}  // namespace
+}  // namespace corvane

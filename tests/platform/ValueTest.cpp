@@ -1,0 +1,104 @@
+#include "platform/Value.h"
+
+#include <gtest/gtest.h>
+
+#include "support/Values.h"
+
+namespace corvane {
+namespace {
+
+using test::A;
+using test::D;
+using test::S;
+
+TEST(Dictionary, TwoHoldersOfOneDictionarySeeTheSameChanges) {
+  Dictionary first;
+  Dictionary second = first;
+  second.set("Cell", S("Serving"));
+  EXPECT_EQ(first.size(), 1u);
+  EXPECT_EQ(*first.get("Cell").asString(), "Serving");
+  EXPECT_TRUE(first.isSameObject(second));
+}
+
+TEST(Dictionary, KeepsInsertionOrder) {
+  Dictionary d;
+  for (const char* key : {"zeta", "alpha", "mu", "beta"}) d.set(key, S(key));
+  std::vector<std::string> keys;
+  for (const auto& [k, v] : d.entries()) keys.push_back(k);
+  EXPECT_EQ(keys, (std::vector<std::string>{"zeta", "alpha", "mu", "beta"}));
+}
+
+TEST(Dictionary, SettingAnExistingKeyReplacesTheValueInPlace) {
+  Dictionary d;
+  d.set("a", S("1"));
+  d.set("b", S("2"));
+  d.set("a", S("3"));
+  ASSERT_EQ(d.size(), 2u);
+  EXPECT_EQ(d.entries()[0].first, "a");
+  EXPECT_EQ(*d.entries()[0].second.asString(), "3");
+}
+
+TEST(Dictionary, RemoveKeepsTheOrderAndTheLookupOfTheOthers) {
+  Dictionary d;
+  for (const char* key : {"a", "b", "c", "d"}) d.set(key, S(key));
+  EXPECT_TRUE(d.remove("b"));
+  EXPECT_FALSE(d.remove("b"));
+  EXPECT_EQ(d.entries()[1].first, "c");
+  EXPECT_EQ(*d.get("d").asString(), "d");
+  EXPECT_EQ(*d.get("c").asString(), "c");
+  EXPECT_TRUE(d.get("b").isNull());
+}
+
+TEST(Dictionary, ShallowCopyIsANewDictionarySharingNestedContainers) {
+  Dictionary inner;
+  Dictionary outer = test::Dict({{"inner", Value(inner)}});
+  Dictionary copy = outer.shallowCopy();
+  EXPECT_FALSE(copy.isSameObject(outer));
+  copy.set("extra", S("x"));
+  EXPECT_FALSE(outer.contains("extra"));
+  inner.set("seen", S("yes"));
+  EXPECT_TRUE(copy.get("inner").asDictionary()->contains("seen"));
+}
+
+TEST(Dictionary, DeepCopySharesNothing) {
+  Dictionary inner;
+  Dictionary outer = test::Dict({{"inner", Value(inner)}});
+  Dictionary copy = outer.deepCopy();
+  inner.set("seen", S("yes"));
+  EXPECT_FALSE(copy.get("inner").asDictionary()->contains("seen"));
+  EXPECT_EQ(copy.get("inner"), Value(Dictionary()));
+}
+
+TEST(Array, TwoHoldersSeeTheSameChangesAndRemoveFirstStopsAtTheEnd) {
+  Array a;
+  Array b = a;
+  b.append(S("x"));
+  b.append(S("y"));
+  EXPECT_EQ(a.size(), 2u);
+  a.removeFirst(1);
+  EXPECT_EQ(*b.at(0).asString(), "y");
+  a.removeFirst(10);
+  EXPECT_TRUE(b.empty());
+  EXPECT_THROW((void)a.at(0), std::out_of_range);
+}
+
+TEST(Value, EqualityIsStructural) {
+  EXPECT_EQ(D({{"a", A({S("x"), Value::integer(3)})}}), D({{"a", A({S("x"), Value::integer(3)})}}));
+  EXPECT_NE(D({{"a", S("x")}}), D({{"a", S("y")}}));
+  EXPECT_NE(Value::integer(1), Value::real(1.0));
+  EXPECT_NE(Value::boolean(true), Value::integer(1));
+  EXPECT_NE(Value(), S(""));
+}
+
+TEST(Value, TypeNamesAreTheClassNamesShownInDiagnostics) {
+  EXPECT_STREQ(Value::integer(1).typeName(), "Integer");
+  EXPECT_STREQ(Value::real(1).typeName(), "Real");
+  EXPECT_STREQ(Value::boolean(true).typeName(), "Boolean");
+  EXPECT_STREQ(Value(Date{0}).typeName(), "Date");
+  EXPECT_STREQ(Value(Bytes{1}).typeName(), "Data");
+  EXPECT_STREQ(S("x").typeName(), "String");
+  EXPECT_STREQ(Value().typeName(), "Null");
+}
+
+}  // namespace
+}  // namespace corvane

@@ -1,0 +1,160 @@
+// corvane-decode, run as a user runs it.
+
+#include <gtest/gtest.h>
+
+#include <nlohmann/json.hpp>
+
+#include "support/Process.h"
+#include "support/Values.h"
+
+namespace corvane {
+namespace {
+
+using test::A;
+using test::D;
+using test::runProcess;
+using test::S;
+
+const std::string kDecode = CORVANE_DECODE_BINARY;
+const std::string kSample = std::string(CORVANE_SOURCE_DIR) + "/tools/samples/ifx-gsm-serving-cell.plist";
+
+std::string asText(const Bytes& b) { return std::string(b.begin(), b.end()); }
+
+std::string hexLine(const Bytes& b) {
+  static const char* digits = "0123456789abcdef";
+  std::string out;
+  for (std::uint8_t c : b) {
+    if (!out.empty()) out += ' ';
+    out += digits[c >> 4];
+    out += digits[c & 15];
+  }
+  return out;
+}
+
+TEST(DecodeTool, JsonOfAnXmlPacketIsTheFoldedTree) {
+  const std::string packet = asText(test::xmlBytes(D({
+      {"Serving", D({{"ARFCN", S("62")}})},
+      {"Neighbours", A({S("header"), D({{"ARFCN", S("70")}, {"RxLev", S("-80")}}), S("z")})},
+  })));
+  test::TemporaryDirectory dir;
+  const auto r = runProcess({kDecode, "--technology", "IFX", "--format", "json", dir.write("p.plist", packet)});
+  ASSERT_EQ(r.exitCode, 0) << r.err;
+  EXPECT_EQ(r.err, "");
+  const auto expected = nlohmann::ordered_json::parse(R"({"name": "Corvane", "children": [
+      {"name": "Serving", "value": "62"},
+      {"name": "Neighbours", "children": [
+        {"name": "0", "children": [{"name": "ARFCN", "value": "70"}, {"name": "RxLev", "value": "-80"}]},
+        {"name": "1", "value": "z"}]}]})");
+  EXPECT_EQ(nlohmann::ordered_json::parse(r.out), expected);
+  EXPECT_EQ(r.out.find("\"name\""), r.out.find('{') + 4) << "name comes first in each object:\n" << r.out;
+}
+
+TEST(DecodeTool, TextIsAnIndentedTreeWithNameValueLeaves) {
+  const auto r = runProcess({kDecode, "--technology", "IFX", kSample});
+  ASSERT_EQ(r.exitCode, 0) << r.err;
+  EXPECT_EQ(r.out.substr(0, r.out.find("  Neighbour")),
+            "Corvane\n"
+            "  Serving Cell\n"
+            "    PLMN: 262-01\n"
+            "    LAC: 0x1A2B\n"
+            "    Cell ID: 40961\n"
+            "    ARFCN: 62\n"
+            "    BSIC: 5-3\n"
+            "    RxLev: -71 dBm\n"
+            "    RxQual: 0\n"
+            "    Band: GSM 900\n");
+  EXPECT_NE(r.out.find("    2: 523\n"), std::string::npos) << r.out;
+}
+
+TEST(DecodeTool, PacketsFoldInOrderAndOnlyTheLastShows) {
+  const std::string hex = "# two packets\n" + hexLine(test::xmlBytes(D({{"Serving", S("62")}}))) + "\n" +
+                          hexLine(test::binaryBytes(D({{"Serving", S("70")}}))) + "\n";
+  const auto r = runProcess({kDecode, "-t", "IFX"}, hex);
+  ASSERT_EQ(r.exitCode, 0) << r.err;
+  EXPECT_EQ(r.out, "Corvane\n  Serving: 70\n");
+}
+
+TEST(DecodeTool, ADashReadsStandardInput) {
+  const auto r = runProcess({kDecode, "-t", "IFX", "-"}, asText(test::xmlBytes(D({{"Serving", S("62")}}))));
+  ASSERT_EQ(r.exitCode, 0) << r.err;
+  EXPECT_EQ(r.out, "Corvane\n  Serving: 62\n");
+}
+
+TEST(DecodeTool, NoPacketsShowsTheEmptyState) {
+  const auto r = runProcess({kDecode, "-t", "IFX"}, "# nothing yet\n");
+  ASSERT_EQ(r.exitCode, 0) << r.err;
+  EXPECT_EQ(r.out, "Corvane: (unknown)\n");
+}
+
+TEST(DecodeTool, ANumberEndsItWithTheAssertionMessage) {
+  test::TemporaryDirectory dir;
+  const auto file = dir.write("n.plist", asText(test::xmlBytes(D({{"Serving", D({{"ARFCN", Value::integer(62)}})}}))));
+  const auto r = runProcess({kDecode, "--technology", "IFX", "--format", "json", file});
+  EXPECT_NE(r.exitCode, 0);
+  EXPECT_EQ(r.exitCode, 3);
+  EXPECT_EQ(r.out, "");
+  EXPECT_EQ(r.err,
+            "corvane-decode: assertion failure in LogGenerator/GSM/GSMLogGenerator:78: "
+            "Unknown object of type Integer encountered\n");
+}
+
+TEST(DecodeTool, AHexPacketThatIsNoPropertyListEndsItWithTheDeserializeAssertion) {
+  const auto r = runProcess({kDecode, "-t", "IFX"}, "81 01 02 03\n");
+  EXPECT_EQ(r.exitCode, 3);
+  EXPECT_NE(r.err.find("Could not deserialize the object"), std::string::npos) << r.err;
+}
+
+TEST(DecodeTool, LogWritesTheDecodersLinesToStandardError) {
+  const auto r = runProcess({kDecode, "-t", "IFX", "--log", kSample});
+  ASSERT_EQ(r.exitCode, 0) << r.err;
+  EXPECT_EQ(r.err.rfind("<4> Creating Log object: 0x", 0), 0u) << r.err;
+  const auto quiet = runProcess({kDecode, "-t", "IFX", kSample});
+  EXPECT_EQ(quiet.err, "");
+}
+
+TEST(DecodeTool, ABadHexLineNamesItsLineNumberAndExitsWithOne) {
+  const auto r = runProcess({kDecode, "-t", "IFX"}, "01 02\n\n0x03\n");
+  EXPECT_EQ(r.exitCode, 1);
+  EXPECT_EQ(r.out, "");
+  EXPECT_EQ(r.err, "corvane-decode: standard input:3: bad hex line: 'x' is not a hex digit (column 2)\n");
+}
+
+TEST(DecodeTool, AnUnreadableFileExitsWithOne) {
+  const auto r = runProcess({kDecode, "-t", "IFX", "/nonexistent/capture.hex"});
+  EXPECT_EQ(r.exitCode, 1);
+  EXPECT_EQ(r.err, "corvane-decode: /nonexistent/capture.hex: cannot open: No such file or directory\n");
+}
+
+TEST(DecodeTool, AMalformedPropertyListFileExitsWithOne) {
+  test::TemporaryDirectory dir;
+  const auto r = runProcess({kDecode, "-t", "IFX", dir.write("bad.plist", "<?xml version=\"1.0\"?><plist><dict>")});
+  EXPECT_EQ(r.exitCode, 1);
+  EXPECT_NE(r.err.find("bad.plist: malformed XML property list"), std::string::npos) << r.err;
+}
+
+TEST(DecodeTool, BadUsageExitsWithTwo) {
+  for (const auto& args : std::vector<std::vector<std::string>>{
+           {kDecode},
+           {kDecode, "--technology"},
+           {kDecode, "--technology", "WiMAX"},
+           {kDecode, "-t", "IFX", "--format", "xml"},
+           {kDecode, "-t", "IFX", "--bogus"},
+       }) {
+    const auto r = runProcess(args);
+    EXPECT_EQ(r.exitCode, 2) << args.back();
+    EXPECT_EQ(r.err.rfind("corvane-decode: ", 0), 0u) << r.err;
+    EXPECT_NE(r.err.find("Usage: corvane-decode"), std::string::npos) << r.err;
+  }
+}
+
+TEST(DecodeTool, HelpAndVersion) {
+  const auto help = runProcess({kDecode, "--help"});
+  EXPECT_EQ(help.exitCode, 0);
+  EXPECT_EQ(help.out.rfind("Usage: corvane-decode --technology NAME", 0), 0u);
+  const auto version = runProcess({kDecode, "--version"});
+  EXPECT_EQ(version.exitCode, 0);
+  EXPECT_EQ(version.out.rfind("corvane-decode ", 0), 0u);
+}
+
+}  // namespace
+}  // namespace corvane
