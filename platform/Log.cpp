@@ -19,7 +19,7 @@ std::shared_ptr<Sink>& currentSink() {
   return s;
 }
 
-std::string vformat(const char* fmt, va_list args) {
+__attribute__((format(printf, 1, 0))) std::string vformat(const char* fmt, va_list args) {
   va_list copy;
   va_copy(copy, args);
   const int n = std::vsnprintf(nullptr, 0, fmt, copy);

@@ -60,19 +60,17 @@ bool toValue(plist_t node, int depth, Value& out, std::string& error) {
       return true;
     }
     case PLIST_STRING: {
-      char* raw = nullptr;
-      plist_get_string_val(node, &raw);
-      MallocString s(raw);
-      out = Value(std::string(s ? s.get() : ""));
+      // Read with its length: a string may hold NUL characters.
+      std::uint64_t length = 0;
+      const char* chars = plist_get_string_ptr(node, &length);
+      out = Value(chars ? std::string(chars, length) : std::string());
       return true;
     }
     case PLIST_DATA: {
-      char* raw = nullptr;
       std::uint64_t length = 0;
-      plist_get_data_val(node, &raw, &length);
-      MallocString d(raw);
-      const auto* bytes = reinterpret_cast<const std::uint8_t*>(d.get());
-      out = Value(d ? Bytes(bytes, bytes + length) : Bytes());
+      const char* chars = plist_get_data_ptr(node, &length);
+      const auto* bytes = reinterpret_cast<const std::uint8_t*>(chars);
+      out = Value(bytes ? Bytes(bytes, bytes + length) : Bytes());
       return true;
     }
     case PLIST_DATE: {
@@ -98,6 +96,8 @@ bool toValue(plist_t node, int depth, Value& out, std::string& error) {
       plist_dict_iter it = nullptr;
       plist_dict_new_iter(node, &it);
       std::unique_ptr<void, decltype(&std::free)> iterGuard(it, &std::free);
+      // A key holding a NUL character comes back cut at the NUL; the library
+      // offers no way to read such a key whole.
       for (;;) {
         char* rawKey = nullptr;
         plist_t item = nullptr;
