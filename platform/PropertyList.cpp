@@ -2,6 +2,9 @@
 
 #include <plist/plist.h>
 
+#include <QByteArray>
+#include <QString>
+
 #include <cstdlib>
 #include <cstring>
 #include <limits>
@@ -117,6 +120,21 @@ bool toValue(plist_t node, int depth, Value& out, std::string& error) {
   }
 }
 
+// The library writes strings that are not valid UTF-8 in a form that it cannot
+// read back, so such strings are refused when writing.
+bool isValidUtf8(const std::string& s) {
+  for (unsigned char c : s) {
+    if (c >= 0x80) {
+      // Valid UTF-8, and only that, survives decoding and encoding unchanged.
+      const QByteArray bytes = QByteArray::fromRawData(s.data(), static_cast<qsizetype>(s.size()));
+      return QString::fromUtf8(bytes).toUtf8() == bytes;
+    }
+  }
+  return true;
+}
+
+constexpr const char* kInvalidUtf8 = "a string that is not valid UTF-8 cannot be written to a property list";
+
 NodePtr toNode(const Value& value, int depth, std::string& error) {
   if (depth > kMaximumNesting) {
     error = "containers nested more than " + std::to_string(kMaximumNesting) + " deep";
@@ -127,6 +145,10 @@ NodePtr toNode(const Value& value, int depth, std::string& error) {
       error = "a null value cannot be written to a property list";
       return nullptr;
     case Value::Type::String:
+      if (!isValidUtf8(*value.asString())) {
+        error = kInvalidUtf8;
+        return nullptr;
+      }
       return NodePtr(plist_new_string(value.asString()->c_str()));
     case Value::Type::Integer:
       return NodePtr(plist_new_uint(static_cast<std::uint64_t>(*value.asInteger())));
@@ -165,6 +187,10 @@ NodePtr toNode(const Value& value, int depth, std::string& error) {
     case Value::Type::Dictionary: {
       NodePtr dict(plist_new_dict());
       for (const auto& [key, v] : value.asDictionary()->entries()) {
+        if (!isValidUtf8(key)) {
+          error = kInvalidUtf8;
+          return nullptr;
+        }
         NodePtr child = toNode(v, depth + 1, error);
         if (!child) return nullptr;
         plist_dict_set_item(dict.get(), key.c_str(), child.release());

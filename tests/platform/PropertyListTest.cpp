@@ -87,6 +87,25 @@ TEST(PropertyList, ANullValueCannotBeWritten) {
   EXPECT_THROW(plist::serializeOrThrow(Value(), plist::Format::Binary), plist::PropertyListError);
 }
 
+TEST(PropertyList, AStringThatIsNotUtf8CannotBeWritten) {
+  for (const Value& v : {S("caf\xE9"), D({{"\x9A" "ame", S("x")}})}) {
+    for (auto format : {plist::Format::XML, plist::Format::Binary}) {
+      std::string error;
+      EXPECT_FALSE(plist::serialize(v, format, &error));
+      EXPECT_EQ(error, "a string that is not valid UTF-8 cannot be written to a property list");
+    }
+  }
+}
+
+TEST(PropertyList, ARawNulInsideXmlTextIsReadWithoutACrash) {
+  // The library keeps such a string's length, so it is read by length, not up to the NUL.
+  const Bytes xml = bytesOf(std::string("<?xml version=\"1.0\"?><plist><string>a\0b</string></plist>", 56));
+  const Value v = plist::parseOrThrow(xml);
+  ASSERT_TRUE(v.isString());
+  EXPECT_EQ(v.asString()->size(), 3u);
+  EXPECT_EQ(v.asString()->front(), 'a');
+}
+
 TEST(PropertyList, NestingBeyondTheLimitIsRefusedOnReadAndWrite) {
   std::string xml = "<?xml version=\"1.0\"?><plist>";
   for (int i = 0; i < plist::kMaximumNesting + 2; ++i) xml += "<array>";
