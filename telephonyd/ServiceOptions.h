@@ -1,0 +1,32 @@
+#pragma once
+
+// The command line of corvane-telephonyd.
+
+#include <cstdint>
+#include <string>
+
+namespace corvane::telephonyd {
+
+struct ServiceOptions {
+  std::string technology = "IFX";
+  std::uint64_t seed = 1;
+  // Packets per second; 0 streams as fast as the clients take them.
+  double rate = 2.0;
+  // Packets per channel before the service stops sending to it; 0 for no limit.
+  std::uint64_t packetLimit = 0;
+  bool logToStandardError = false;
+};
+
+struct ParsedOptions {
+  ServiceOptions options;
+  bool exit = false;   // true: print and exit with exitCode instead of running
+  int exitCode = 0;
+  std::string output;  // for standard output (help, version)
+  std::string error;   // one line for standard error, without the program name
+};
+
+ParsedOptions parseServiceOptions(int argc, char** argv);
+
+std::string serviceUsage();
+
+}  // namespace corvane::telephonyd
