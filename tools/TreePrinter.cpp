@@ -40,8 +40,8 @@ std::string treeAsText(const CorvaneModelNode& root) {
   return out;
 }
 
-std::string treeAsJson(const CorvaneModelNode& root) {
-  return toJson(root).dump(2, ' ', false, nlohmann::ordered_json::error_handler_t::replace) + "\n";
+std::string treeAsJson(const CorvaneModelNode& root, bool compact) {
+  return toJson(root).dump(compact ? -1 : 2, ' ', false, nlohmann::ordered_json::error_handler_t::replace) + "\n";
 }
 
 std::string formatTree(const CorvaneModelNode& root, TreeFormat format) {

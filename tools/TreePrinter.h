@@ -12,7 +12,8 @@ namespace corvane::tools {
 enum class TreeFormat { Text, Json };
 
 std::string treeAsText(const CorvaneModelNode& root);
-std::string treeAsJson(const CorvaneModelNode& root);
+// Pretty-printed over several lines, or `compact` on one line (one document per line).
+std::string treeAsJson(const CorvaneModelNode& root, bool compact = false);
 std::string formatTree(const CorvaneModelNode& root, TreeFormat format);
 
 }  // namespace corvane::tools

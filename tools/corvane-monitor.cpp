@@ -1,0 +1,174 @@
+// corvane-monitor: the application without screens. Runs the monitor model
+// against the telephony service and prints the display tree after every
+// display update, for scripts, tests and SSH sessions.
+
+#include <getopt.h>
+
+#include <QCoreApplication>
+#include <QSocketNotifier>
+
+#include <csignal>
+#include <cstdio>
+#include <cstdlib>
+#include <memory>
+#include <string>
+#include <sys/socket.h>
+#include <unistd.h>
+
+#include "TreePrinter.h"
+#include "model/CorvaneModel.h"
+#include "platform/Assertion.h"
+#include "platform/DateText.h"
+#include "platform/Log.h"
+#include "platform/QtRunLoop.h"
+#include "platform/RuntimeDirectory.h"
+#include "platform/SocketMessagePort.h"
+#include "platform/SocketTelephonyClient.h"
+#include "platform/Uuid.h"
+#include "platform/Version.h"
+
+namespace {
+
+constexpr int kExitFailure = 1;
+constexpr int kExitUsage = 2;
+
+constexpr const char* kUsage = "Usage: corvane-monitor [--format text|json] [--updates N] [--log]\n";
+
+void printHelp() {
+  std::printf(
+      "%s"
+      "\n"
+      "Connects to the telephony service (corvane-telephonyd), decodes the packets\n"
+      "of its log channel and prints the display tree after every display update\n"
+      "(at most every 2 s, when packets arrived). It retries every 5 s while the\n"
+      "service is unreachable and keeps its history across reconnects.\n"
+      "\n"
+      "Options:\n"
+      "  -f, --format FORMAT  text (an indented tree, followed by a blank line) or\n"
+      "                       json (one compact JSON document per line)\n"
+      "  -n, --updates N      stop after N display updates (default: run until\n"
+      "                       interrupted)\n"
+      "  -l, --log            also write the system-log lines to standard error as\n"
+      "                       \"<priority> <text>\"\n"
+      "  -h, --help           show this help\n"
+      "  -V, --version        show the version\n"
+      "\n"
+      "The runtime directory is $CORVANE_RUNTIME_DIR, else $XDG_RUNTIME_DIR/corvane,\n"
+      "else /tmp/corvane-$UID.\n",
+      kUsage);
+}
+
+int usageError(const std::string& message) {
+  std::fprintf(stderr, "corvane-monitor: %s\n%s", message.c_str(), kUsage);
+  return kExitUsage;
+}
+
+// SIGINT and SIGTERM end the event loop through a socket pair, so that the
+// model tears its ports down before the program ends.
+int signalPipe[2] = {-1, -1};
+void onSignal(int) {
+  const char c = 1;
+  [[maybe_unused]] const auto n = ::write(signalPipe[1], &c, 1);
+}
+
+class Monitor final : public corvane::CorvaneModelDelegate {
+ public:
+  Monitor(corvane::tools::TreeFormat format, long updates) : format_(format), remaining_(updates) {}
+  void setModel(corvane::CorvaneModel* model) { model_ = model; }
+
+  void updateViewControllerFromModel() override {
+    corvane::NodeRef root = model_->topLevelNodes();
+    if (!root) return;
+    const std::string text = format_ == corvane::tools::TreeFormat::Json ? corvane::tools::treeAsJson(*root, true)
+                                                                         : corvane::tools::treeAsText(*root) + "\n";
+    std::fwrite(text.data(), 1, text.size(), stdout);
+    std::fflush(stdout);
+    if (remaining_ > 0 && --remaining_ == 0) QCoreApplication::quit();
+  }
+
+ private:
+  corvane::tools::TreeFormat format_;
+  long remaining_;  // 0: no limit
+  corvane::CorvaneModel* model_ = nullptr;
+};
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  using namespace corvane;
+  installTerminateHandler();
+
+  std::string format = "text";
+  long updates = 0;
+  bool logToStderr = false;
+
+  static const option kOptions[] = {
+      {"format", required_argument, nullptr, 'f'}, {"updates", required_argument, nullptr, 'n'},
+      {"log", no_argument, nullptr, 'l'},          {"help", no_argument, nullptr, 'h'},
+      {"version", no_argument, nullptr, 'V'},      {nullptr, 0, nullptr, 0},
+  };
+  opterr = 0;
+  for (;;) {
+    const int c = getopt_long(argc, argv, ":f:n:lhV", kOptions, nullptr);
+    if (c == -1) break;
+    switch (c) {
+      case 'f': format = optarg; break;
+      case 'n': {
+        char* end = nullptr;
+        errno = 0;
+        updates = std::strtol(optarg, &end, 10);
+        if (errno != 0 || end == optarg || *end != '\0' || updates < 1) {
+          return usageError(std::string("--updates needs a whole number of at least 1, not \"") + optarg + "\"");
+        }
+        break;
+      }
+      case 'l': logToStderr = true; break;
+      case 'h': printHelp(); return 0;
+      case 'V': std::printf("corvane-monitor %s\n", kVersion); return 0;
+      case ':': return usageError(std::string("option ") + argv[optind - 1] + " needs a value");
+      default: return usageError(std::string("unknown option ") + argv[optind - 1]);
+    }
+  }
+  if (optind < argc) return usageError(std::string("unexpected argument \"") + argv[optind] + "\"");
+  tools::TreeFormat treeFormat;
+  if (format == "text") {
+    treeFormat = tools::TreeFormat::Text;
+  } else if (format == "json") {
+    treeFormat = tools::TreeFormat::Json;
+  } else {
+    return usageError("unknown format \"" + format + "\" (text or json)");
+  }
+
+  const RuntimeDirectoryResult directory = prepareRuntimeDirectory();
+  if (!directory) {
+    std::fprintf(stderr, "corvane-monitor: %s\n", directory.error.c_str());
+    return kExitFailure;
+  }
+  if (logToStderr) {
+    log::setSink(std::make_shared<log::TeeSink>(
+        std::vector<std::shared_ptr<log::Sink>>{log::sink(), std::make_shared<log::StderrSink>()}));
+  }
+
+  QCoreApplication app(argc, argv);
+  if (::socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, signalPipe) != 0) {
+    std::perror("corvane-monitor: socketpair");
+    return kExitFailure;
+  }
+  QSocketNotifier signalNotifier(signalPipe[0], QSocketNotifier::Read);
+  QObject::connect(&signalNotifier, &QSocketNotifier::activated, &app, [] { QCoreApplication::quit(); });
+  std::signal(SIGINT, onSignal);
+  std::signal(SIGTERM, onSignal);
+  std::signal(SIGPIPE, SIG_IGN);
+
+  QtRunLoop runLoop;
+  SocketPortSystem ports(directory.path);
+  SocketTelephonyClient telephony(ports);
+  Monitor monitor(treeFormat, updates);
+  {
+    CorvaneModel model(CorvaneModelEnvironment{runLoop, ports, telephony, &makeUUIDText}, &monitor);
+    monitor.setModel(&model);
+    runLoop.dispatchAsync([&model] { model.restartMonitor(); });
+    app.exec();
+  }
+  return 0;
+}
