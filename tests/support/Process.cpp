@@ -1,6 +1,7 @@
 #include "support/Process.h"
 
 #include <fcntl.h>
+#include <signal.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -69,6 +70,34 @@ ProcessResult runProcess(const std::vector<std::string>& argv, const std::string
   result.out = readFile(out);
   result.err = readFile(err);
   return result;
+}
+
+int startProcess(const std::vector<std::string>& argv, const std::vector<std::string>& extraEnvironment,
+                 const std::string& logFile) {
+  const pid_t pid = fork();
+  if (pid < 0) throw std::runtime_error("fork failed");
+  if (pid == 0) {
+    const int nullIn = open("/dev/null", O_RDONLY);
+    const int out = open(logFile.empty() ? "/dev/null" : logFile.c_str(), O_WRONLY | O_CREAT | O_APPEND, 0600);
+    if (nullIn < 0 || out < 0) _exit(127);
+    dup2(nullIn, 0);
+    dup2(out, 1);
+    dup2(out, 2);
+    for (const auto& e : extraEnvironment) putenv(const_cast<char*>(e.c_str()));
+    std::vector<char*> args;
+    for (const auto& a : argv) args.push_back(const_cast<char*>(a.c_str()));
+    args.push_back(nullptr);
+    execv(args[0], args.data());
+    _exit(127);
+  }
+  return pid;
+}
+
+int stopProcess(int pid, int signal) {
+  kill(pid, signal);
+  int status = 0;
+  waitpid(pid, &status, 0);
+  return WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
 }
 
 }  // namespace corvane::test

@@ -17,6 +17,13 @@ struct ProcessResult {
 ProcessResult runProcess(const std::vector<std::string>& argv, const std::string& input = "",
                          const std::vector<std::string>& extraEnvironment = {});
 
+// Starts a program in the background with extra environment entries ("NAME=value");
+// its standard output and error go to `logFile` when given, else to /dev/null.
+int startProcess(const std::vector<std::string>& argv, const std::vector<std::string>& extraEnvironment = {},
+                 const std::string& logFile = "");
+// Sends the signal and waits for the process; returns its exit status as runProcess does.
+int stopProcess(int pid, int signal);
+
 // A fresh temporary directory, removed with everything in it when the object dies.
 class TemporaryDirectory {
  public:
