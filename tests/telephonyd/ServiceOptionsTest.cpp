@@ -1,0 +1,71 @@
+#include "telephonyd/ServiceOptions.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+namespace corvane::telephonyd {
+namespace {
+
+ParsedOptions parse(std::vector<std::string> arguments) {
+  arguments.insert(arguments.begin(), "corvane-telephonyd");
+  std::vector<char*> argv;
+  for (auto& a : arguments) argv.push_back(a.data());
+  argv.push_back(nullptr);
+  return parseServiceOptions(static_cast<int>(arguments.size()), argv.data());
+}
+
+TEST(ServiceOptionsTest, DefaultsSimulateIFXAtTwoPacketsPerSecond) {
+  const ParsedOptions parsed = parse({});
+  EXPECT_FALSE(parsed.exit);
+  EXPECT_EQ(parsed.options.technology, "IFX");
+  EXPECT_EQ(parsed.options.seed, 1u);
+  EXPECT_EQ(parsed.options.rate, 2.0);
+  EXPECT_EQ(parsed.options.packetLimit, 0u);
+}
+
+TEST(ServiceOptionsTest, ValuesAreRead) {
+  const ParsedOptions parsed = parse({"--technology", "Quendra_LTE", "--seed=99", "-r", "250.5", "--packets", "10"});
+  EXPECT_FALSE(parsed.exit) << parsed.error;
+  EXPECT_EQ(parsed.options.technology, "Quendra_LTE");
+  EXPECT_EQ(parsed.options.seed, 99u);
+  EXPECT_EQ(parsed.options.rate, 250.5);
+  EXPECT_EQ(parsed.options.packetLimit, 10u);
+}
+
+TEST(ServiceOptionsTest, MaxAndZeroRateMeanFullSpeed) {
+  EXPECT_EQ(parse({"--rate", "max"}).options.rate, 0.0);
+  EXPECT_EQ(parse({"--rate", "0"}).options.rate, 0.0);
+}
+
+TEST(ServiceOptionsTest, BadInputExitsWithStatus2AndOneLine) {
+  const std::vector<std::vector<std::string>> bad = {
+      {"--bogus"}, {"--seed", "x"}, {"--seed", "-3"}, {"--rate", "fast"}, {"--rate", "-1"},
+      {"--rate"},  {"extra"},       {"--technology", "Nope"}};
+  for (const auto& arguments : bad) {
+    const ParsedOptions parsed = parse(arguments);
+    EXPECT_TRUE(parsed.exit) << arguments[0];
+    EXPECT_EQ(parsed.exitCode, 2) << arguments[0];
+    EXPECT_FALSE(parsed.error.empty());
+    EXPECT_EQ(parsed.error.find('\n'), std::string::npos);
+  }
+  EXPECT_EQ(parse({"--bogus"}).error, "unknown option '--bogus' (see --help)");
+  EXPECT_EQ(parse({"--technology", "Nope"}).error,
+            "unknown technology 'Nope' (known: IFX, Quendra_GSM, Quendra_CDMA, Quendra_LTE, Quendra_UTRAN2) "
+            "(see --help)");
+}
+
+TEST(ServiceOptionsTest, HelpAndVersionPrintAndExitWithStatus0) {
+  const ParsedOptions help = parse({"--help"});
+  EXPECT_TRUE(help.exit);
+  EXPECT_EQ(help.exitCode, 0);
+  EXPECT_NE(help.output.find("--technology"), std::string::npos);
+  const ParsedOptions version = parse({"--version"});
+  EXPECT_TRUE(version.exit);
+  EXPECT_EQ(version.exitCode, 0);
+  EXPECT_EQ(version.output.rfind("corvane-telephonyd ", 0), 0u);
+}
+
+}  // namespace
+}  // namespace corvane::telephonyd
