@@ -46,7 +46,8 @@ RuntimeDirectoryResult prepareRuntimeDirectory(const std::filesystem::path& dire
   if (::mkdir(path.c_str(), 0700) == 0) {
     // The umask may have narrowed the mode; it can never have widened it, but
     // set it exactly so the check below does not depend on the umask.
-    if (::chmod(path.c_str(), 0700) != 0) return failure(directory, std::string("cannot be set to mode 0700: ") + std::strerror(errno));
+    if (::chmod(path.c_str(), 0700) != 0)
+      return failure(directory, std::string("cannot be set to mode 0700: ") + std::strerror(errno));
   } else if (errno != EEXIST) {
     return failure(directory, std::string("cannot be created: ") + std::strerror(errno));
   }
@@ -54,7 +55,8 @@ RuntimeDirectoryResult prepareRuntimeDirectory(const std::filesystem::path& dire
   // lstat, so that a symbolic link planted in a shared /tmp is refused instead
   // of being followed to somebody else's directory.
   struct stat info {};
-  if (::lstat(path.c_str(), &info) != 0) return failure(directory, std::string("cannot be examined: ") + std::strerror(errno));
+  if (::lstat(path.c_str(), &info) != 0)
+    return failure(directory, std::string("cannot be examined: ") + std::strerror(errno));
   if (!S_ISDIR(info.st_mode)) return failure(directory, "is not a directory");
   if (info.st_uid != geteuid()) {
     return failure(directory, "is owned by uid " + std::to_string(info.st_uid) + ", not by this user (uid " +

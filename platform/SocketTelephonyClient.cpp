@@ -28,9 +28,9 @@ class SocketTelephonyConnection final : public TelephonyConnection {
     if (!data) return {kTelephonyDomainProtocol, kTelephonyErrorMalformedReply};
 
     std::optional<Bytes> replyData;
-    const std::int32_t status = service_->sendRequest(kTelephonyCreateLogChannelMessage, *data,
-                                                      kTelephonyRequestSendTimeout, kTelephonyRequestReceiveTimeout,
-                                                      &replyData);
+    const std::int32_t status =
+        service_->sendRequest(kTelephonyCreateLogChannelMessage, *data, kTelephonyRequestSendTimeout,
+                              kTelephonyRequestReceiveTimeout, &replyData);
     if (status != kPortSuccess) return {kTelephonyDomainTransport, status};
     if (!replyData) return {kTelephonyDomainProtocol, kTelephonyErrorNoReply};
 
@@ -42,7 +42,8 @@ class SocketTelephonyConnection final : public TelephonyConnection {
     if (!domain || !code || !domain->asInteger() || !code->asInteger()) {
       return {kTelephonyDomainProtocol, kTelephonyErrorMalformedReply};
     }
-    TelephonyError error{static_cast<std::int32_t>(*domain->asInteger()), static_cast<std::int32_t>(*code->asInteger())};
+    TelephonyError error{static_cast<std::int32_t>(*domain->asInteger()),
+                         static_cast<std::int32_t>(*code->asInteger())};
     if (error.code == 0) {
       // The caller checks for a missing or empty name itself and says so.
       if (const Value* name = fields->find(kTelephonyKeyRemotePortName); name && name->asString()) {

@@ -56,8 +56,8 @@ int main(int argc, char** argv) {
   }
   const ServiceOptions& options = parsed.options;
   if (options.logToStandardError) {
-    log::setSink(std::make_shared<log::TeeSink>(
-        std::vector<std::shared_ptr<log::Sink>>{std::make_shared<log::SyslogSink>(), std::make_shared<log::StderrSink>()}));
+    log::setSink(std::make_shared<log::TeeSink>(std::vector<std::shared_ptr<log::Sink>>{
+        std::make_shared<log::SyslogSink>(), std::make_shared<log::StderrSink>()}));
   }
 
   std::string error;

@@ -1,11 +1,10 @@
-#include "platform/SocketTelephonyClient.h"
-
 #include <gtest/gtest.h>
 
 #include "PortServerThread.h"
 #include "RuntimeTestDirectory.h"
 #include "platform/PropertyList.h"
 #include "platform/SocketMessagePort.h"
+#include "platform/SocketTelephonyClient.h"
 
 namespace corvane {
 namespace {
@@ -53,7 +52,8 @@ TEST_F(SocketTelephonyClientTest, LogChannelRequestNamesTheLocalPortAndReturnsTh
   serve([&](MessageId id, const Value& request) {
     askedWith = id;
     if (const Dictionary* d = request.asDictionary()) {
-      if (const Value* name = d->find(kTelephonyKeyLocalPortName); name && name->asString()) askedFor = *name->asString();
+      if (const Value* name = d->find(kTelephonyKeyLocalPortName); name && name->asString())
+        askedFor = *name->asString();
     }
     return std::optional<Bytes>(reply(0, 0, "corvane-telephonyd.channel.1"));
   });
