@@ -84,18 +84,20 @@ bool toValue(plist_t node, int depth, Value& out, std::string& error) {
       return true;
     }
     case PLIST_ARRAY: {
-      Array array;
+      std::vector<Value> elements;
       const std::uint32_t n = plist_array_get_size(node);
+      elements.reserve(n);
       for (std::uint32_t i = 0; i < n; ++i) {
         Value element;
         if (!toValue(plist_array_get_item(node, i), depth + 1, element, error)) return false;
-        array.append(std::move(element));
+        elements.push_back(std::move(element));
       }
-      out = Value(std::move(array));
+      out = Value(Array(std::move(elements)));
       return true;
     }
     case PLIST_DICT: {
       Dictionary dict;
+      dict.reserve(plist_dict_get_size(node));
       plist_dict_iter it = nullptr;
       plist_dict_new_iter(node, &it);
       std::unique_ptr<void, decltype(&std::free)> iterGuard(it, &std::free);

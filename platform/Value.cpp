@@ -11,9 +11,39 @@ struct KeyHash {
 };
 }  // namespace
 
+// Small dictionaries, the common case, are searched linearly; a hash index is
+// built only once a dictionary grows past kIndexThreshold entries.
+constexpr std::size_t kIndexThreshold = 12;
+
 struct Dictionary::Storage {
+  using Index = std::unordered_map<std::string, std::size_t, KeyHash, std::equal_to<>>;
+
   std::vector<Entry> entries;
-  std::unordered_map<std::string, std::size_t, KeyHash, std::equal_to<>> index;
+  std::unique_ptr<Index> index;
+
+  Storage() = default;
+  Storage(const Storage& other) : entries(other.entries) { rebuildIndex(); }
+
+  std::ptrdiff_t position(std::string_view key) const {
+    if (index) {
+      auto it = index->find(key);
+      return it == index->end() ? -1 : static_cast<std::ptrdiff_t>(it->second);
+    }
+    for (std::size_t i = 0; i < entries.size(); ++i) {
+      if (entries[i].first == key) return static_cast<std::ptrdiff_t>(i);
+    }
+    return -1;
+  }
+
+  void rebuildIndex() {
+    if (entries.size() <= kIndexThreshold) {
+      index.reset();
+      return;
+    }
+    index = std::make_unique<Index>();
+    index->reserve(entries.size());
+    for (std::size_t i = 0; i < entries.size(); ++i) index->emplace(entries[i].first, i);
+  }
 };
 
 struct Array::Storage {
@@ -27,13 +57,13 @@ Dictionary::Dictionary() : storage_(std::make_shared<Storage>()) {}
 std::size_t Dictionary::size() const { return storage_->entries.size(); }
 
 const Value* Dictionary::find(std::string_view key) const {
-  auto it = storage_->index.find(key);
-  return it == storage_->index.end() ? nullptr : &storage_->entries[it->second].second;
+  const std::ptrdiff_t pos = storage_->position(key);
+  return pos < 0 ? nullptr : &storage_->entries[static_cast<std::size_t>(pos)].second;
 }
 
 Value* Dictionary::findMutable(std::string_view key) const {
-  auto it = storage_->index.find(key);
-  return it == storage_->index.end() ? nullptr : &storage_->entries[it->second].second;
+  const std::ptrdiff_t pos = storage_->position(key);
+  return pos < 0 ? nullptr : &storage_->entries[static_cast<std::size_t>(pos)].second;
 }
 
 Value Dictionary::get(std::string_view key) const {
@@ -46,37 +76,41 @@ void Dictionary::set(std::string_view key, Value value) const {
     *existing = std::move(value);
     return;
   }
-  storage_->index.emplace(std::string(key), storage_->entries.size());
-  storage_->entries.emplace_back(std::string(key), std::move(value));
+  Storage& s = *storage_;
+  s.entries.emplace_back(std::string(key), std::move(value));
+  if (s.index) {
+    s.index->emplace(s.entries.back().first, s.entries.size() - 1);
+  } else if (s.entries.size() > kIndexThreshold) {
+    s.rebuildIndex();
+  }
 }
 
 bool Dictionary::remove(std::string_view key) const {
-  auto it = storage_->index.find(key);
-  if (it == storage_->index.end()) return false;
-  const std::size_t pos = it->second;
-  storage_->index.erase(it);
-  storage_->entries.erase(storage_->entries.begin() + static_cast<std::ptrdiff_t>(pos));
-  for (auto& [k, i] : storage_->index) {
-    if (i > pos) --i;
-  }
+  const std::ptrdiff_t pos = storage_->position(key);
+  if (pos < 0) return false;
+  storage_->entries.erase(storage_->entries.begin() + pos);
+  storage_->rebuildIndex();
   return true;
 }
 
 void Dictionary::clear() const {
   storage_->entries.clear();
-  storage_->index.clear();
+  storage_->index.reset();
 }
+
+void Dictionary::reserve(std::size_t count) const { storage_->entries.reserve(count); }
 
 const std::vector<Dictionary::Entry>& Dictionary::entries() const { return storage_->entries; }
 
 Dictionary Dictionary::shallowCopy() const {
   Dictionary copy;
-  *copy.storage_ = *storage_;
+  copy.storage_ = std::make_shared<Storage>(*storage_);
   return copy;
 }
 
 Dictionary Dictionary::deepCopy() const {
   Dictionary copy;
+  copy.reserve(size());
   for (const auto& [key, value] : storage_->entries) copy.set(key, value.deepCopy());
   return copy;
 }

@@ -51,6 +51,7 @@ class Dictionary {
   void set(std::string_view key, Value value) const;
   bool remove(std::string_view key) const;
   void clear() const;
+  void reserve(std::size_t count) const;
 
   // Entries in insertion order.
   const std::vector<Entry>& entries() const;

@@ -50,6 +50,7 @@ Value GSMLogGenerator::processObject(const Value& object) {
   if (object.isString()) return object;
   if (const Dictionary* dict = object.asDictionary()) {
     Dictionary out;
+    out.reserve(dict->size());
     for (const auto& [key, value] : dict->entries()) out.set(key, collapsed(processObject(value)));
     return Value(out);
   }

@@ -49,6 +49,29 @@ TEST(Dictionary, RemoveKeepsTheOrderAndTheLookupOfTheOthers) {
   EXPECT_TRUE(d.get("b").isNull());
 }
 
+TEST(Dictionary, LargeDictionariesFindEveryKeyAfterSetsRemovesAndCopies) {
+  Dictionary d;
+  for (int i = 0; i < 40; ++i) d.set("key " + std::to_string(i), Value::integer(i));
+  d.set("key 7", Value::integer(700));
+  for (int i = 0; i < 40; i += 3) EXPECT_TRUE(d.remove("key " + std::to_string(i)));
+  const Dictionary copy = d.shallowCopy();
+  for (const Dictionary& each : {d, copy}) {
+    for (int i = 0; i < 40; ++i) {
+      const Value* v = each.find("key " + std::to_string(i));
+      if (i % 3 == 0) {
+        EXPECT_EQ(v, nullptr) << i;
+      } else {
+        ASSERT_NE(v, nullptr) << i;
+        EXPECT_EQ(*v->asInteger(), i == 7 ? 700 : i);
+      }
+    }
+  }
+  EXPECT_EQ(d.entries().front().first, "key 1");
+  while (d.size() > 2) d.remove(d.entries().back().first);
+  EXPECT_EQ(*d.get("key 2").asInteger(), 2);
+  EXPECT_EQ(copy.size(), 26u);
+}
+
 TEST(Dictionary, ShallowCopyIsANewDictionarySharingNestedContainers) {
   Dictionary inner;
   Dictionary outer = test::Dict({{"inner", Value(inner)}});
