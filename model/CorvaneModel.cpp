@@ -127,7 +127,13 @@ void CorvaneModel::configureGenerator() {
   }
   // A technology that is not a string equals none of the known ones.
   const std::string* name = technology->asString();
-  _logGenerator = name ? LogGenerator::generatorFromTechnology(*name) : nullptr;
+  if (!name) {
+    _logGenerator = nullptr;
+  } else if (_environment.generatorFromTechnology) {
+    _logGenerator = _environment.generatorFromTechnology(*name);
+  } else {
+    _logGenerator = LogGenerator::generatorFromTechnology(*name);
+  }
   log::printf(log::kError, "Got log generated: %s", log::pointerText(_logGenerator.get()).c_str());
 }
 

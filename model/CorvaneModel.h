@@ -36,6 +36,9 @@ struct CorvaneModelEnvironment {
   TelephonyClient& telephony;
   // Makes the text of a new UUID; nothing when that fails.
   std::function<std::optional<std::string>()> makeUUID;
+  // Chooses the generator of a technology; LogGenerator::generatorFromTechnology when empty.
+  // Benchmarks put a counting generator here.
+  std::function<std::unique_ptr<LogGenerator>(std::string_view technology)> generatorFromTechnology = {};
 };
 
 class CorvaneModel {
