@@ -121,15 +121,25 @@ class Value {
   bool isDictionary() const { return type() == Type::Dictionary; }
   bool isArray() const { return type() == Type::Array; }
 
-  // Each returns nullptr when the value is of another type.
-  const std::string* asString() const { return std::get_if<std::string>(&v_); }
-  const std::int64_t* asInteger() const { return std::get_if<std::int64_t>(&v_); }
-  const double* asReal() const { return std::get_if<double>(&v_); }
-  const bool* asBoolean() const { return std::get_if<bool>(&v_); }
-  const corvane::Date* asDate() const { return std::get_if<corvane::Date>(&v_); }
-  const Bytes* asData() const { return std::get_if<Bytes>(&v_); }
-  const Dictionary* asDictionary() const { return std::get_if<Dictionary>(&v_); }
-  const Array* asArray() const { return std::get_if<Array>(&v_); }
+  // Each returns nullptr when the value is of another type. The pointer points
+  // into this value, so these are not offered on temporaries, where it would
+  // dangle: keep the value (or find() it in its container) first.
+  const std::string* asString() const& { return std::get_if<std::string>(&v_); }
+  const std::int64_t* asInteger() const& { return std::get_if<std::int64_t>(&v_); }
+  const double* asReal() const& { return std::get_if<double>(&v_); }
+  const bool* asBoolean() const& { return std::get_if<bool>(&v_); }
+  const corvane::Date* asDate() const& { return std::get_if<corvane::Date>(&v_); }
+  const Bytes* asData() const& { return std::get_if<Bytes>(&v_); }
+  const Dictionary* asDictionary() const& { return std::get_if<Dictionary>(&v_); }
+  const Array* asArray() const& { return std::get_if<Array>(&v_); }
+  const std::string* asString() const&& = delete;
+  const std::int64_t* asInteger() const&& = delete;
+  const double* asReal() const&& = delete;
+  const bool* asBoolean() const&& = delete;
+  const corvane::Date* asDate() const&& = delete;
+  const Bytes* asData() const&& = delete;
+  const Dictionary* asDictionary() const&& = delete;
+  const Array* asArray() const&& = delete;
 
   // The class name shown in diagnostics: "String", "Integer", ...
   const char* typeName() const { return typeName(type()); }

@@ -103,7 +103,7 @@ TEST_F(IfxDecoder, EachPacketReplacesThePreviousEntirely) {
 TEST_F(IfxDecoder, GeneratingADisplayAppendsAHistorySnapshot) {
   display(D({{"Serving", S("62")}}));
   display(D({{"Serving", S("63")}}));
-  const Array& history = *state_.get("History").asArray();
+  const Array& history = *state_.find("History")->asArray();
   ASSERT_EQ(history.size(), 2u);
   EXPECT_EQ(history.at(1).asDictionary()->get("Display"), D({{"Serving", S("63")}}));
 }
@@ -119,7 +119,7 @@ TEST_F(IfxDecoder, SaveContentsWithoutHistoryIsAnEmptyArray) {
 TEST_F(IfxDecoder, SaveContentsIsANewArraySharingTheSnapshots) {
   display(D({{"Serving", S("62")}}));
   const Value contents = generator_.getSaveContentsFromState(state_);
-  const Array& history = *state_.get("History").asArray();
+  const Array& history = *state_.find("History")->asArray();
   ASSERT_EQ(contents.asArray()->size(), 1u);
   EXPECT_FALSE(contents.asArray()->isSameObject(history));
   EXPECT_TRUE(contents.asArray()->at(0).asDictionary()->isSameObject(*history.at(0).asDictionary()));

@@ -33,8 +33,8 @@ class History : public ::testing::Test {
 
   static std::vector<std::string> historyTags(const Dictionary& state) {
     std::vector<std::string> tags;
-    for (const Value& snapshot : state.get("History").asArray()->elements()) {
-      tags.push_back(*snapshot.asDictionary()->get("DisplayState").asString());
+    for (const Value& snapshot : state.find("History")->asArray()->elements()) {
+      tags.push_back(*snapshot.asDictionary()->find("DisplayState")->asString());
     }
     return tags;
   }
@@ -63,7 +63,7 @@ TEST_F(History, AHistoryOfSevenIsCutToTheNewestFourBeforeTheNewSnapshot) {
   state.set("History", Value(history));
   LogGenerator::updateHistoryInState(state);
   EXPECT_EQ(historyTags(state), (std::vector<std::string>{"old 4", "old 5", "old 6", "old 7", "raw new"}));
-  EXPECT_TRUE(state.get("History").asArray()->isSameObject(history)) << "the history array is changed in place";
+  EXPECT_TRUE(state.find("History")->asArray()->isSameObject(history)) << "the history array is changed in place";
 }
 
 TEST_F(History, AStateWithoutDisplayStateGivesAnEmptySnapshot) {
@@ -71,7 +71,7 @@ TEST_F(History, AStateWithoutDisplayStateGivesAnEmptySnapshot) {
   state.set("Display", D({}));
   state.set("ExtraInfo", D({}));
   LogGenerator::updateHistoryInState(state);
-  const Array& history = *state.get("History").asArray();
+  const Array& history = *state.find("History")->asArray();
   ASSERT_EQ(history.size(), 1u);
   EXPECT_EQ(history.at(0), D({}));
 }
@@ -81,31 +81,31 @@ TEST_F(History, TheFirstMissingValueEndsTheSnapshot) {
   state.set("DisplayState", S("raw"));
   state.set("ExtraInfo", D({}));  // no "Display"
   LogGenerator::updateHistoryInState(state);
-  EXPECT_EQ(state.get("History").asArray()->at(0), D({{"DisplayState", S("raw")}}));
+  EXPECT_EQ(state.find("History")->asArray()->at(0), D({{"DisplayState", S("raw")}}));
 
   Dictionary noExtra;
   noExtra.set("DisplayState", S("raw"));
   noExtra.set("Display", S("shown"));
   LogGenerator::updateHistoryInState(noExtra);
-  EXPECT_EQ(noExtra.get("History").asArray()->at(0), D({{"DisplayState", S("raw")}, {"Display", S("shown")}}));
+  EXPECT_EQ(noExtra.find("History")->asArray()->at(0), D({{"DisplayState", S("raw")}, {"Display", S("shown")}}));
 }
 
 TEST_F(History, ASnapshotHoldsShallowCopiesThenDateAndDescriptionInOrder) {
   Dictionary state = stateWithDisplay("A");
   LogGenerator::updateHistoryInState(state);
-  const Dictionary& snapshot = *state.get("History").asArray()->at(0).asDictionary();
+  const Dictionary& snapshot = *state.find("History")->asArray()->at(0).asDictionary();
   std::vector<std::string> keys;
   for (const auto& [k, v] : snapshot.entries()) keys.push_back(k);
   EXPECT_EQ(keys, (std::vector<std::string>{"DisplayState", "Display", "ExtraInfo", "Date", "Description"}));
-  EXPECT_EQ(*snapshot.get("Date").asString(), "2026-11-16 08:00:00 +0000");
-  EXPECT_EQ(*snapshot.get("Description").asString(), "Snapshot (2026-11-16 08:00:01 +0000)")
+  EXPECT_EQ(*snapshot.find("Date")->asString(), "2026-11-16 08:00:00 +0000");
+  EXPECT_EQ(*snapshot.find("Description")->asString(), "Snapshot (2026-11-16 08:00:01 +0000)")
       << "the date is read once for each entry";
 
   // A copy, not the state's own dictionary: later changes to the state don't reach it.
-  const Dictionary& display = *state.get("Display").asDictionary();
-  EXPECT_FALSE(snapshot.get("Display").asDictionary()->isSameObject(display));
+  const Dictionary& display = *state.find("Display")->asDictionary();
+  EXPECT_FALSE(snapshot.find("Display")->asDictionary()->isSameObject(display));
   display.set("Cell", S("changed"));
-  EXPECT_EQ(*snapshot.get("Display").asDictionary()->get("Cell").asString(), "A");
+  EXPECT_EQ(*snapshot.find("Display")->asDictionary()->find("Cell")->asString(), "A");
 }
 
 TEST_F(History, AHistoryValueThatIsNoArrayIsReplaced) {

@@ -40,7 +40,7 @@ TEST_P(RoundTrip, EveryValueTypeSurvivesWritingAndReading) {
   const Value read = plist::parseOrThrow(written);
   EXPECT_EQ(read, original);
   // Order of dictionary keys is kept as written.
-  const auto& entries = read.asDictionary()->get("dict").asDictionary()->entries();
+  const auto& entries = read.asDictionary()->find("dict")->asDictionary()->entries();
   EXPECT_EQ(entries.front().first, "z");
 }
 

@@ -16,7 +16,7 @@ TEST(Dictionary, TwoHoldersOfOneDictionarySeeTheSameChanges) {
   Dictionary second = first;
   second.set("Cell", S("Serving"));
   EXPECT_EQ(first.size(), 1u);
-  EXPECT_EQ(*first.get("Cell").asString(), "Serving");
+  EXPECT_EQ(*first.find("Cell")->asString(), "Serving");
   EXPECT_TRUE(first.isSameObject(second));
 }
 
@@ -44,8 +44,8 @@ TEST(Dictionary, RemoveKeepsTheOrderAndTheLookupOfTheOthers) {
   EXPECT_TRUE(d.remove("b"));
   EXPECT_FALSE(d.remove("b"));
   EXPECT_EQ(d.entries()[1].first, "c");
-  EXPECT_EQ(*d.get("d").asString(), "d");
-  EXPECT_EQ(*d.get("c").asString(), "c");
+  EXPECT_EQ(*d.find("d")->asString(), "d");
+  EXPECT_EQ(*d.find("c")->asString(), "c");
   EXPECT_TRUE(d.get("b").isNull());
 }
 
@@ -68,7 +68,7 @@ TEST(Dictionary, LargeDictionariesFindEveryKeyAfterSetsRemovesAndCopies) {
   }
   EXPECT_EQ(d.entries().front().first, "key 1");
   while (d.size() > 2) d.remove(d.entries().back().first);
-  EXPECT_EQ(*d.get("key 2").asInteger(), 2);
+  EXPECT_EQ(*d.find("key 2")->asInteger(), 2);
   EXPECT_EQ(copy.size(), 26u);
 }
 
@@ -80,7 +80,7 @@ TEST(Dictionary, ShallowCopyIsANewDictionarySharingNestedContainers) {
   copy.set("extra", S("x"));
   EXPECT_FALSE(outer.contains("extra"));
   inner.set("seen", S("yes"));
-  EXPECT_TRUE(copy.get("inner").asDictionary()->contains("seen"));
+  EXPECT_TRUE(copy.find("inner")->asDictionary()->contains("seen"));
 }
 
 TEST(Dictionary, DeepCopySharesNothing) {
@@ -88,7 +88,7 @@ TEST(Dictionary, DeepCopySharesNothing) {
   Dictionary outer = test::Dict({{"inner", Value(inner)}});
   Dictionary copy = outer.deepCopy();
   inner.set("seen", S("yes"));
-  EXPECT_FALSE(copy.get("inner").asDictionary()->contains("seen"));
+  EXPECT_FALSE(copy.find("inner")->asDictionary()->contains("seen"));
   EXPECT_EQ(copy.get("inner"), Value(Dictionary()));
 }
 

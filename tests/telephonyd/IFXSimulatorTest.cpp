@@ -103,11 +103,11 @@ TEST(IFXSimulatorTest, NeighbourChannelsDifferFromTheServingChannelAndEachOther)
   for (int i = 0; i < 500; ++i) simulator.nextPacket();
   const Value report = simulator.report();
   std::set<std::string> channels;
-  channels.insert(*report.asDictionary()->get("Serving Cell").asDictionary()->get("ARFCN").asString());
-  const Array neighbours = *report.asDictionary()->get("Neighbour Cells").asArray();
+  channels.insert(*report.asDictionary()->find("Serving Cell")->asDictionary()->find("ARFCN")->asString());
+  const Array neighbours = *report.asDictionary()->find("Neighbour Cells")->asArray();
   EXPECT_EQ(neighbours.at(0), Value("Neighbour Cells"));
   for (std::size_t i = 1; i < neighbours.size(); ++i) {
-    channels.insert(*neighbours.at(i).asDictionary()->get("ARFCN").asString());
+    channels.insert(*neighbours.at(i).asDictionary()->find("ARFCN")->asString());
   }
   EXPECT_EQ(channels.size(), IFXSimulator::kNeighbourCount + 1);
 }
