@@ -524,24 +524,30 @@ std::shared_ptr<RemoteMessagePort> SocketPortSystem::createRemotePort(const std:
   return createSocketRemotePort(name);
 }
 
+// Checks the name, fills the socket address of its path and makes an unbound
+// socket; -1 with a one-line reason when any of that fails.
+int SocketPortSystem::openSocketFor(const std::string& name, const std::filesystem::path& path, sockaddr_un& address,
+                                    std::string* error) {
+  if (!isValidPortName(name)) {
+    setError(error, "invalid port name \"" + name + "\"");
+    return -1;
+  }
+  if (!fillAddress(path, address)) {
+    setError(error, "socket path " + path.string() + " is too long for a Unix-domain socket");
+    return -1;
+  }
+  const int fd = newSocket();
+  if (fd < 0) setError(error, std::string("cannot create a socket: ") + std::strerror(errno));
+  return fd;
+}
+
 std::shared_ptr<SocketLocalPort> SocketPortSystem::createSocketLocalPort(const std::string& name,
                                                                          LocalMessagePort::Callback callback,
                                                                          std::string* error) {
-  if (!isValidPortName(name)) {
-    setError(error, "invalid port name \"" + name + "\"");
-    return nullptr;
-  }
   const std::filesystem::path path = socketPath(name);
   sockaddr_un address{};
-  if (!fillAddress(path, address)) {
-    setError(error, "socket path " + path.string() + " is too long for a Unix-domain socket");
-    return nullptr;
-  }
-  const int fd = newSocket();
-  if (fd < 0) {
-    setError(error, std::string("cannot create a socket: ") + std::strerror(errno));
-    return nullptr;
-  }
+  const int fd = openSocketFor(name, path, address, error);
+  if (fd < 0) return nullptr;
   const auto* sa = reinterpret_cast<const sockaddr*>(&address);
   if (::bind(fd, sa, sizeof address) != 0) {
     if (errno != EADDRINUSE) {
@@ -585,21 +591,10 @@ std::shared_ptr<SocketLocalPort> SocketPortSystem::createSocketLocalPort(const s
 
 std::shared_ptr<SocketRemotePort> SocketPortSystem::createSocketRemotePort(const std::string& name,
                                                                            std::string* error) {
-  if (!isValidPortName(name)) {
-    setError(error, "invalid port name \"" + name + "\"");
-    return nullptr;
-  }
   const std::filesystem::path path = socketPath(name);
   sockaddr_un address{};
-  if (!fillAddress(path, address)) {
-    setError(error, "socket path " + path.string() + " is too long for a Unix-domain socket");
-    return nullptr;
-  }
-  const int fd = newSocket();
-  if (fd < 0) {
-    setError(error, std::string("cannot create a socket: ") + std::strerror(errno));
-    return nullptr;
-  }
+  const int fd = openSocketFor(name, path, address, error);
+  if (fd < 0) return nullptr;
   const auto giveUp = Clock::now() + kConnectPatience;
   for (;;) {
     if (::connect(fd, reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0) break;

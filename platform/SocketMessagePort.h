@@ -27,6 +27,8 @@
 #include <string_view>
 #include <vector>
 
+#include <sys/un.h>
+
 #include "platform/MessagePort.h"
 
 namespace corvane {
@@ -151,6 +153,9 @@ class SocketPortSystem final : public MessagePortSystem {
   static bool isValidPortName(std::string_view name);
 
  private:
+  static int openSocketFor(const std::string& name, const std::filesystem::path& path, sockaddr_un& address,
+                           std::string* error);
+
   std::filesystem::path directory_;
 };
 

@@ -11,6 +11,7 @@
 
 #include "LogGenerator/LogGenerator.h"
 #include "PacketInput.h"
+#include "CommandLine.h"
 #include "TreePrinter.h"
 #include "model/CorvaneModelNode.h"
 #include "platform/Assertion.h"
@@ -21,7 +22,6 @@
 namespace {
 
 constexpr int kExitInput = 1;
-constexpr int kExitUsage = 2;
 constexpr int kExitAssertion = 3;
 
 constexpr const char* kUsage =
@@ -53,8 +53,7 @@ void printHelp() {
 }
 
 int usageError(const std::string& message) {
-  std::fprintf(stderr, "corvane-decode: %s\n%s", message.c_str(), kUsage);
-  return kExitUsage;
+  return corvane::tools::usageError("corvane-decode", kUsage, message);
 }
 
 bool isKnownTechnology(const std::string& name) {
@@ -97,14 +96,8 @@ int main(int argc, char** argv) {
   }
   if (technology.empty()) return usageError("--technology NAME is required");
   if (!isKnownTechnology(technology)) return usageError("unknown technology \"" + technology + "\"");
-  tools::TreeFormat treeFormat;
-  if (format == "text") {
-    treeFormat = tools::TreeFormat::Text;
-  } else if (format == "json") {
-    treeFormat = tools::TreeFormat::Json;
-  } else {
-    return usageError("unknown format \"" + format + "\" (text or json)");
-  }
+  const std::optional<tools::TreeFormat> treeFormat = tools::treeFormatNamed(format);
+  if (!treeFormat) return usageError("unknown format \"" + format + "\" (text or json)");
 
   std::vector<std::string> inputs(argv + optind, argv + argc);
   if (inputs.empty()) inputs.emplace_back("-");
@@ -128,8 +121,7 @@ int main(int argc, char** argv) {
   }
 
   if (logToStderr) {
-    log::setSink(std::make_shared<log::TeeSink>(
-        std::vector<std::shared_ptr<log::Sink>>{log::sink(), std::make_shared<log::StderrSink>()}));
+    tools::copyLogToStandardError();
   }
 
   std::unique_ptr<LogGenerator> generator = LogGenerator::generatorFromTechnology(technology);
@@ -141,7 +133,7 @@ int main(int argc, char** argv) {
     const Value display = generator->generateLogUsingState(state);
     PathDictionary paths;
     const NodeRef root = CorvaneModelNode::makeTreeFromObject(display, paths);
-    const std::string text = tools::formatTree(*root, treeFormat);
+    const std::string text = tools::formatTree(*root, *treeFormat);
     std::fwrite(text.data(), 1, text.size(), stdout);
   } catch (const AssertionFailure& failure) {
     std::fflush(stdout);

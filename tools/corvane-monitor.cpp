@@ -15,6 +15,7 @@
 #include <sys/socket.h>
 #include <unistd.h>
 
+#include "CommandLine.h"
 #include "TreePrinter.h"
 #include "model/CorvaneModel.h"
 #include "platform/Assertion.h"
@@ -30,7 +31,6 @@
 namespace {
 
 constexpr int kExitFailure = 1;
-constexpr int kExitUsage = 2;
 
 constexpr const char* kUsage = "Usage: corvane-monitor [--format text|json] [--updates N] [--log]\n";
 
@@ -59,8 +59,7 @@ void printHelp() {
 }
 
 int usageError(const std::string& message) {
-  std::fprintf(stderr, "corvane-monitor: %s\n%s", message.c_str(), kUsage);
-  return kExitUsage;
+  return corvane::tools::usageError("corvane-monitor", kUsage, message);
 }
 
 // SIGINT and SIGTERM end the event loop through a socket pair, so that the
@@ -130,14 +129,8 @@ int main(int argc, char** argv) {
     }
   }
   if (optind < argc) return usageError(std::string("unexpected argument \"") + argv[optind] + "\"");
-  tools::TreeFormat treeFormat;
-  if (format == "text") {
-    treeFormat = tools::TreeFormat::Text;
-  } else if (format == "json") {
-    treeFormat = tools::TreeFormat::Json;
-  } else {
-    return usageError("unknown format \"" + format + "\" (text or json)");
-  }
+  const std::optional<tools::TreeFormat> treeFormat = tools::treeFormatNamed(format);
+  if (!treeFormat) return usageError("unknown format \"" + format + "\" (text or json)");
 
   const RuntimeDirectoryResult directory = prepareRuntimeDirectory();
   if (!directory) {
@@ -145,8 +138,7 @@ int main(int argc, char** argv) {
     return kExitFailure;
   }
   if (logToStderr) {
-    log::setSink(std::make_shared<log::TeeSink>(
-        std::vector<std::shared_ptr<log::Sink>>{log::sink(), std::make_shared<log::StderrSink>()}));
+    tools::copyLogToStandardError();
   }
 
   QCoreApplication app(argc, argv);
@@ -163,7 +155,7 @@ int main(int argc, char** argv) {
   QtRunLoop runLoop;
   SocketPortSystem ports(directory.path);
   SocketTelephonyClient telephony(ports);
-  Monitor monitor(treeFormat, updates);
+  Monitor monitor(*treeFormat, updates);
   {
     CorvaneModel model(CorvaneModelEnvironment{runLoop, ports, telephony, &makeUUIDText}, &monitor);
     monitor.setModel(&model);
