@@ -66,7 +66,7 @@ int main(int argc, char** argv) {
   const RuntimeDirectoryResult runtime = prepareRuntimeDirectory();
   if (!runtime) return fail(runtime.error);
 
-  // The termination signalFd arrive as readable data on the run loop, so that
+  // The termination signals arrive as readable data on the run loop, so that
   // shutdown runs as ordinary loop work and can remove the socket files. They
   // are blocked before Qt starts any thread, so that no thread takes them.
   sigset_t termination;
@@ -75,7 +75,7 @@ int main(int argc, char** argv) {
   sigaddset(&termination, SIGINT);
   pthread_sigmask(SIG_BLOCK, &termination, nullptr);
   const int signalFd = ::signalfd(-1, &termination, SFD_NONBLOCK | SFD_CLOEXEC);
-  if (signalFd < 0) return fail("cannot watch for termination signalFd");
+  if (signalFd < 0) return fail("cannot watch for termination signals");
   // Writes to a vanished client must fail with EPIPE, never end the service.
   std::signal(SIGPIPE, SIG_IGN);
 
