@@ -162,40 +162,47 @@ TEST(DisplayTree, PathsJoinNamesOfNestedNodes) {
   ArrayLock::mutex().unlock();  // the nested array left the lock held once more; give it back
 }
 
+// Holds the array lock on another thread until release() or destruction.
+class ArrayLockHeldElsewhere {
+ public:
+  ArrayLockHeldElsewhere()
+      : holder_([this] {
+          ArrayLock::lockArray();
+          locked_.set_value();
+          released_.get_future().wait();
+          ArrayLock::unlockArray();
+        }) {
+    locked_.get_future().wait();
+  }
+  ~ArrayLockHeldElsewhere() { release(); }
+  void release() {
+    if (!holder_.joinable()) return;
+    released_.set_value();
+    holder_.join();
+  }
+
+ private:
+  std::promise<void> locked_, released_;
+  std::thread holder_;
+};
+
 TEST(DisplayTree, ArraysAreWalkedUnderTheArrayLock) {
   // While another thread holds the lock, building a tree with an array waits.
-  std::promise<void> locked, release;
-  std::thread holder([&] {
-    ArrayLock::lockArray();
-    locked.set_value();
-    release.get_future().wait();
-    ArrayLock::unlockArray();
-  });
-  locked.get_future().wait();
+  ArrayLockHeldElsewhere held;
   auto build = std::async(std::launch::async, [] {
     PathDictionary paths;
     return CorvaneModelNode::makeTreeFromObject(A({S("x")}), paths);
   });
   EXPECT_EQ(build.wait_for(std::chrono::milliseconds(100)), std::future_status::timeout);
-  release.set_value();
-  holder.join();
+  held.release();
   EXPECT_EQ(childNames(*build.get()), std::vector<std::string>{"0"});
   EXPECT_EQ(ArrayLock::depth(), 0);
 }
 
 TEST(DisplayTree, DictionariesAloneDoNotTakeTheArrayLock) {
-  std::promise<void> locked, release;
-  std::thread holder([&] {
-    ArrayLock::lockArray();
-    locked.set_value();
-    release.get_future().wait();
-    ArrayLock::unlockArray();
-  });
-  locked.get_future().wait();
+  ArrayLockHeldElsewhere held;
   PathDictionary paths;
   NodeRef root = CorvaneModelNode::makeTreeFromObject(D({{"a", D({{"b", S("c")}})}}), paths);
-  release.set_value();
-  holder.join();
   EXPECT_EQ(paths.size(), 3u);
 }
 

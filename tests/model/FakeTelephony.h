@@ -25,54 +25,54 @@ struct SentCommand {
 
 class FakeTelephony;
 
-class FakeLocalPort final : public LocalMessagePort {
+// Validity and the invalidation callback, as both kinds of port have them.
+template <typename Port>
+class FakePort : public Port {
+ public:
+  void invalidate() override {
+    if (!valid_) return;
+    valid_ = false;
+    typename Port::InvalidationCallback callback = std::move(invalidation_);
+    invalidation_ = nullptr;
+    if (callback) callback(*this);
+  }
+  void setInvalidationCallback(typename Port::InvalidationCallback callback) override {
+    invalidation_ = std::move(callback);
+  }
+  bool hasInvalidationCallback() const { return static_cast<bool>(invalidation_); }
+
+ protected:
+  typename Port::InvalidationCallback invalidation_;
+  bool valid_ = true;
+};
+
+class FakeLocalPort final : public FakePort<LocalMessagePort> {
  public:
   FakeLocalPort(std::string name, Callback callback) : name_(std::move(name)), callback_(std::move(callback)) {}
   const std::string& name() const override { return name_; }
   bool isValid() const override { return valid_; }
-  void invalidate() override {
-    if (!valid_) return;
-    valid_ = false;
-    InvalidationCallback callback = std::move(invalidation_);
-    invalidation_ = nullptr;
-    if (callback) callback(*this);
-  }
-  void setInvalidationCallback(InvalidationCallback callback) override { invalidation_ = std::move(callback); }
   void scheduleOn(RunLoop& runLoop) override { runLoop_ = &runLoop; }
 
   std::optional<Bytes> deliver(MessageId id, const Bytes& data) { return callback_(*this, id, data); }
   bool scheduled() const { return runLoop_ != nullptr; }
-  bool hasInvalidationCallback() const { return static_cast<bool>(invalidation_); }
 
  private:
   std::string name_;
   Callback callback_;
-  InvalidationCallback invalidation_;
   RunLoop* runLoop_ = nullptr;
-  bool valid_ = true;
 };
 
-class FakeRemotePort final : public RemoteMessagePort {
+class FakeRemotePort final : public FakePort<RemoteMessagePort> {
  public:
   FakeRemotePort(std::string name, FakeTelephony& service) : name_(std::move(name)), service_(service) {}
   const std::string& name() const override { return name_; }
   bool isValid() const override;
-  void invalidate() override {
-    if (!valid_) return;
-    valid_ = false;
-    InvalidationCallback callback = std::move(invalidation_);
-    invalidation_ = nullptr;
-    if (callback) callback(*this);
-  }
-  void setInvalidationCallback(InvalidationCallback callback) override { invalidation_ = std::move(callback); }
   std::int32_t sendRequest(MessageId id, std::span<const std::uint8_t> data, double sendTimeout, double receiveTimeout,
                            std::optional<Bytes>* reply) override;
 
  private:
   std::string name_;
   FakeTelephony& service_;
-  InvalidationCallback invalidation_;
-  bool valid_ = true;
 };
 
 class FakeTelephony final : public MessagePortSystem, public TelephonyClient {
