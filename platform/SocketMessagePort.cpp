@@ -63,8 +63,14 @@ void appendFrame(std::vector<std::uint8_t>& out, const FrameHeader& header, std:
   out.insert(out.end(), payload.begin(), payload.end());
 }
 
-// The frame at `offset`, or nothing when the datagram is malformed there.
-std::optional<FrameHeader> readFrame(std::span<const std::uint8_t> datagram, std::size_t offset) {
+struct Frame {
+  FrameHeader header;
+  std::span<const std::uint8_t> payload;
+};
+
+// The frame at `offset`, which then moves past it; nothing when the datagram
+// is malformed there.
+std::optional<Frame> takeFrame(std::span<const std::uint8_t> datagram, std::size_t& offset) {
   if (datagram.size() - offset < kFrameHeaderSize) return std::nullopt;
   const std::uint8_t* p = datagram.data() + offset;
   FrameHeader header;
@@ -75,7 +81,9 @@ std::optional<FrameHeader> readFrame(std::span<const std::uint8_t> datagram, std
   header.serial = getU32(p + 8);
   header.length = getU32(p + 12);
   if (header.length > datagram.size() - offset - kFrameHeaderSize) return std::nullopt;
-  return header;
+  const auto payload = datagram.subspan(offset + kFrameHeaderSize, header.length);
+  offset += kFrameHeaderSize + header.length;
+  return Frame{header, payload};
 }
 
 // One message as the datagrams that carry it: one, unless it is too big.
@@ -266,10 +274,10 @@ bool SocketLocalPort::deliverDatagram(const std::shared_ptr<Connection>& connect
                                       std::span<const std::uint8_t> datagram) {
   std::size_t offset = 0;
   while (offset < datagram.size()) {
-    const auto header = readFrame(datagram, offset);
-    if (!header) return false;
-    const auto payload = datagram.subspan(offset + kFrameHeaderSize, header->length);
-    offset += kFrameHeaderSize + header->length;
+    const auto frame = takeFrame(datagram, offset);
+    if (!frame) return false;
+    const FrameHeader* header = &frame->header;
+    const auto payload = frame->payload;
 
     Bytes data;
     if (connection->assembling) {
@@ -441,10 +449,10 @@ std::int32_t SocketRemotePort::awaitReply(std::uint32_t serial, double timeoutSe
     const std::span<const std::uint8_t> datagram(receiveBuffer_.data(), static_cast<std::size_t>(n));
     std::size_t offset = 0;
     while (offset < datagram.size()) {
-      const auto header = readFrame(datagram, offset);
-      if (!header) return kPortTransportError;
-      const auto payload = datagram.subspan(offset + kFrameHeaderSize, header->length);
-      offset += kFrameHeaderSize + header->length;
+      const auto frame = takeFrame(datagram, offset);
+      if (!frame) return kPortTransportError;
+      const FrameHeader* header = &frame->header;
+      const auto payload = frame->payload;
       // Frames of other serials are replies to requests that timed out earlier.
       if (header->serial != serial) continue;
       if (header->kind == FrameKind::EmptyReply) return kPortSuccess;

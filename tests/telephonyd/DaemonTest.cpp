@@ -291,12 +291,7 @@ TEST_F(DaemonTest, SecondServiceOnALiveSocketIsRefused) {
 
 TEST_F(DaemonTest, StaleSocketFileIsReplaced) {
   const std::string path = ports.socketPath(std::string(kTelephonyServicePortName)).string();
-  const int fd = ::socket(AF_UNIX, SOCK_SEQPACKET, 0);
-  sockaddr_un address{};
-  address.sun_family = AF_UNIX;
-  std::strncpy(address.sun_path, path.c_str(), sizeof address.sun_path - 1);
-  ASSERT_EQ(::bind(fd, reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
-  ::close(fd);
+  ASSERT_TRUE(test::leaveStaleSocket(path));
   Daemon daemon(ports, {});
   EXPECT_TRUE(daemon.running());
   Client client(ports, loop);

@@ -3,7 +3,12 @@
 // A private runtime directory for one test, published through
 // CORVANE_RUNTIME_DIR for as long as the test runs.
 
+#include <sys/socket.h>
+#include <sys/un.h>
+#include <unistd.h>
+
 #include <cstdlib>
+#include <cstring>
 #include <string>
 
 #include "platform/RuntimeDirectory.h"
@@ -42,5 +47,18 @@ class RuntimeTestDirectory {
   std::string previous_;
   RuntimeDirectoryResult result_;
 };
+
+// Leaves a socket file at `path` as a process that died leaves it: bound, never
+// unlinked, with nobody listening. True when the file was made.
+inline bool leaveStaleSocket(const std::string& path) {
+  const int fd = ::socket(AF_UNIX, SOCK_SEQPACKET, 0);
+  if (fd < 0) return false;
+  sockaddr_un address{};
+  address.sun_family = AF_UNIX;
+  std::strncpy(address.sun_path, path.c_str(), sizeof address.sun_path - 1);
+  const bool bound = ::bind(fd, reinterpret_cast<sockaddr*>(&address), sizeof address) == 0;
+  ::close(fd);
+  return bound;
+}
 
 }  // namespace corvane::test

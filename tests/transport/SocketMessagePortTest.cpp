@@ -307,12 +307,7 @@ TEST_F(SocketMessagePortTest, LocalPortNameServedByALiveSocketIsRefused) {
 TEST_F(SocketMessagePortTest, StaleSocketFileIsReplaced) {
   // A socket file left behind by a process that died: bound, never unlinked.
   const std::string path = ports.socketPath("stale").string();
-  const int fd = ::socket(AF_UNIX, SOCK_SEQPACKET, 0);
-  sockaddr_un address{};
-  address.sun_family = AF_UNIX;
-  std::strncpy(address.sun_path, path.c_str(), sizeof address.sun_path - 1);
-  ASSERT_EQ(::bind(fd, reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
-  ::close(fd);
+  ASSERT_TRUE(test::leaveStaleSocket(path));
   ASSERT_TRUE(std::filesystem::exists(path));
   EXPECT_EQ(ports.createRemotePort("stale"), nullptr);
 
