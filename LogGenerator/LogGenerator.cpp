@@ -3,6 +3,7 @@
 #include <array>
 
 #include "LogGenerator/GSM/GSMLogGenerator.h"
+#include "LogGenerator/logcode/TechnologyGenerators.h"
 #include "platform/DateText.h"
 #include "platform/Log.h"
 #include "platform/LogChannelTechnology.h"
@@ -18,6 +19,9 @@ struct TechnologyGenerator {
 
 // Searched in order; the first technology equal to the value wins.
 constexpr std::array kGeneratorsByTechnology = {
+    TechnologyGenerator{kLogChannelTechnologyQuendraGSM, &QND_GSMLogGenerator::generator},
+    TechnologyGenerator{kLogChannelTechnologyQuendraLTE, &LTELogGenerator::generator},
+    TechnologyGenerator{kLogChannelTechnologyQuendraUTRAN2, &UTRANLogGenerator::generator},
     TechnologyGenerator{kLogChannelTechnologyIFX, &GSMLogGenerator::generator},
 };
 

@@ -31,6 +31,11 @@ std::string dateText(const Date& date) {
   return t.toString(QStringLiteral("yyyy-MM-dd HH:mm:ss '+0000'")).toStdString();
 }
 
+LocalTimeZone localTimeZoneAt(const Date& date) {
+  const QDateTime local = QDateTime::fromMSecsSinceEpoch(date.microsecondsSince1970 / 1000, Qt::LocalTime);
+  return LocalTimeZone{local.offsetFromUtc(), local.isDaylightTime()};
+}
+
 std::string currentDateText() { return dateText(currentDate()); }
 
 void setDateSourceForTesting(std::function<Date()> s) {

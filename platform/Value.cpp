@@ -54,6 +54,11 @@ struct Array::Storage {
 
 Dictionary::Dictionary() : storage_(std::make_shared<Storage>()) {}
 
+std::optional<Dictionary> Dictionary::Weak::lock() const {
+  if (auto storage = storage_.lock()) return Dictionary(std::move(storage));
+  return std::nullopt;
+}
+
 std::size_t Dictionary::size() const { return storage_->entries.size(); }
 
 const Value* Dictionary::find(std::string_view key) const {
@@ -123,6 +128,11 @@ bool operator==(const Dictionary& a, const Dictionary& b) {
 // --- Array --------------------------------------------------------------------
 
 Array::Array() : storage_(std::make_shared<Storage>()) {}
+
+std::optional<Array> Array::Weak::lock() const {
+  if (auto storage = storage_.lock()) return Array(std::move(storage));
+  return std::nullopt;
+}
 
 Array::Array(std::vector<Value> elements) : storage_(std::make_shared<Storage>()) {
   storage_->elements = std::move(elements);

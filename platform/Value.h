@@ -9,6 +9,7 @@
 #include <cstdint>
 #include <functional>
 #include <memory>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <unordered_map>
@@ -32,6 +33,8 @@ struct Date {
 // mutating operations are const because they change the shared container, not
 // the handle.
 class Dictionary {
+  struct Storage;
+
  public:
   using Entry = std::pair<std::string, Value>;
 
@@ -64,12 +67,26 @@ class Dictionary {
   bool isSameObject(const Dictionary& other) const { return storage_ == other.storage_; }
   const void* identity() const { return storage_.get(); }
 
+  // A reference that does not keep the dictionary alive.
+  class Weak {
+   public:
+    Weak() = default;
+    explicit Weak(const Dictionary& d) : storage_(d.storage_) {}
+    // The dictionary while some handle still holds it, else nothing.
+    std::optional<Dictionary> lock() const;
+
+   private:
+    std::weak_ptr<Storage> storage_;
+  };
+
  private:
-  struct Storage;
+  explicit Dictionary(std::shared_ptr<Storage> storage) : storage_(std::move(storage)) {}
   std::shared_ptr<Storage> storage_;
 };
 
 class Array {
+  struct Storage;
+
  public:
   Array();  // a new, empty array
   explicit Array(std::vector<Value> elements);
@@ -91,8 +108,20 @@ class Array {
   bool isSameObject(const Array& other) const { return storage_ == other.storage_; }
   const void* identity() const { return storage_.get(); }
 
+  // A reference that does not keep the array alive.
+  class Weak {
+   public:
+    Weak() = default;
+    explicit Weak(const Array& a) : storage_(a.storage_) {}
+    // The array while some handle still holds it, else nothing.
+    std::optional<Array> lock() const;
+
+   private:
+    std::weak_ptr<Storage> storage_;
+  };
+
  private:
-  struct Storage;
+  explicit Array(std::shared_ptr<Storage> storage) : storage_(std::move(storage)) {}
   std::shared_ptr<Storage> storage_;
 };
 

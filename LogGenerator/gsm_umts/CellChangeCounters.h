@@ -1,0 +1,17 @@
+#pragma once
+
+// "Cell Change Counters": a placeholder section that takes no packets; it shows what the
+// display template gives it.
+
+#include "LogGenerator/logcode/Base.h"
+
+namespace corvane {
+
+class CellChangeCounters final : public Base {
+ public:
+  void updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) override;
+  std::string getSectionName() const override { return "Cell Change Counters"; }
+  std::vector<std::uint32_t> getLogCodeArray() const override { return {}; }
+};
+
+}  // namespace corvane

@@ -1,0 +1,17 @@
+#pragma once
+
+// "SIM Info": the elementary files of the SIM as the telephony service reports
+// them (extra code 0xFF0000), each shown as it comes.
+
+#include "LogGenerator/logcode/Base.h"
+
+namespace corvane {
+
+class SimInfo final : public Base {
+ public:
+  void updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) override;
+  std::string getSectionName() const override { return "SIM Info"; }
+  std::vector<std::uint32_t> getLogCodeArray() const override { return {0xFF0000}; }
+};
+
+}  // namespace corvane

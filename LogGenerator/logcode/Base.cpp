@@ -1,0 +1,127 @@
+#include "LogGenerator/logcode/Base.h"
+
+#include <array>
+
+#include "LogGenerator/logcode/ArrayLock.h"
+#include "platform/Log.h"
+
+namespace corvane {
+
+// --- CodeDictionary ---
+
+const CodeDictionary::Subscribers* CodeDictionary::find(const std::string& code) const {
+  auto it = index_.find(code);
+  return it == index_.end() ? nullptr : &entries_[it->second].second;
+}
+
+CodeDictionary::Subscribers& CodeDictionary::subscribersFor(const std::string& code) {
+  auto [it, inserted] = index_.try_emplace(code, entries_.size());
+  if (inserted) entries_.emplace_back(code, Subscribers{});
+  return entries_[it->second].second;
+}
+
+std::vector<std::string> CodeDictionary::keys() const {
+  std::vector<std::string> out;
+  out.reserve(entries_.size());
+  for (const auto& entry : entries_) out.push_back(entry.first);
+  return out;
+}
+
+void CodeDictionary::clear() {
+  entries_.clear();
+  index_.clear();
+}
+
+// --- Base ---
+
+namespace {
+
+class ArrayLockHolder {
+ public:
+  ArrayLockHolder() { ArrayLock::lockArray(); }
+  ~ArrayLockHolder() { ArrayLock::unlockArray(); }
+  ArrayLockHolder(const ArrayLockHolder&) = delete;
+  ArrayLockHolder& operator=(const ArrayLockHolder&) = delete;
+};
+
+struct EcnoStep {
+  std::uint32_t above;  // the row applies when the value is greater than this
+  std::int16_t decibels;
+};
+
+// Read from the top; the first row whose bound the value exceeds gives the
+// result. The table is kept as it stands: the last two steps both give -31,
+// and both the saturated top and the bottom give 0.
+constexpr std::array<EcnoStep, 32> kEcnoSteps = {{
+    {417647, -1}, {331808, -2}, {263624, -3}, {209463, -4}, {166441, -5}, {132268, -6}, {105123, -7},
+    {83562, -8},  {66435, -9},  {52830, -10}, {42023, -11}, {33440, -12}, {26621, -13}, {21205, -14},
+    {16903, -15}, {13486, -16}, {10771, -17}, {8615, -18},  {6902, -19},  {5542, -20},  {4461, -21},
+    {3603, -22},  {2921, -23},  {2240, -24},  {1949, -25},  {1607, -26},  {1336, -27},  {1120, -28},
+    {949, -29},   {813, -30},   {756, -31},   {705, -31},
+}};
+constexpr std::uint32_t kEcnoUnity = 524288;
+
+}  // namespace
+
+void Base::updateSectionRef(const Value& container) {
+  if (const Dictionary* d = container.asDictionary()) {
+    sectionRef = Dictionary::Weak(*d);
+  } else if (const Array* a = container.asArray()) {
+    sectionRef = Array::Weak(*a);
+  } else {
+    sectionRef = std::monostate{};
+  }
+  log::printf(log::kWarning, "%s", getSectionName().c_str());
+}
+
+void Base::updateLogCodeDict(CodeDictionary& codeDict) {
+  const auto codes = getLogCodeArray();
+  log::printf(log::kWarning, "Array Count: %d", static_cast<int>(codes.size()));
+  for (std::uint32_t code : codes) {
+    codeDict.subscribersFor(std::to_string(code)).push_back(shared_from_this());
+  }
+}
+
+void Base::clearElementsInArray(const Array& array) {
+  ArrayLockHolder hold;
+  array.clear();
+}
+
+void Base::replaceArray(const Array& target, const Array& source) {
+  ArrayLockHolder hold;
+  // Emptying the target first empties a source that is the target itself.
+  target.clear();
+  for (const auto& element : source.elements()) target.append(element);
+}
+
+std::int16_t Base::lookUpECNO(std::uint32_t value) {
+  if (value >= kEcnoUnity) return 0;
+  for (const auto& step : kEcnoSteps) {
+    if (value > step.above) return step.decibels;
+  }
+  return 0;
+}
+
+std::optional<Dictionary> Base::sectionDictionary() const {
+  if (const auto* weak = std::get_if<Dictionary::Weak>(&sectionRef)) return weak->lock();
+  return std::nullopt;
+}
+
+std::optional<Array> Base::sectionArray() const {
+  if (const auto* weak = std::get_if<Array::Weak>(&sectionRef)) return weak->lock();
+  return std::nullopt;
+}
+
+void Base::setRow(std::string_view key, Value value) const {
+  if (auto d = sectionDictionary()) d->set(key, std::move(value));
+}
+
+void Base::removeRow(std::string_view key) const {
+  if (auto d = sectionDictionary()) d->remove(key);
+}
+
+void Base::logUnknownCode(std::uint32_t logCode) {
+  log::printf(log::kError, "Received an unknown log message: %d", static_cast<std::int32_t>(logCode));
+}
+
+}  // namespace corvane

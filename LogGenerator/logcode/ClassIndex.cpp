@@ -1,0 +1,41 @@
+#include "LogGenerator/logcode/ClassIndex.h"
+
+#include <cstdio>
+
+#include "platform/Log.h"
+
+namespace corvane {
+
+ClassIndex::~ClassIndex() {
+  std::puts("Deallocing ClassIndex");
+  std::fflush(stdout);
+  classDict.clear();
+  codeDictionary.clear();
+}
+
+Base* ClassIndex::getClass(std::string_view name) const {
+  auto it = classDict.find(std::string(name));
+  return it == classDict.end() ? nullptr : it->second.get();
+}
+
+const CodeDictionary::Subscribers* ClassIndex::getSubscribers(std::int32_t logCode) const {
+  return codeDictionary.find(std::to_string(logCode));
+}
+
+void ClassIndex::status() const {
+  // The class dictionary is a dictionary by construction here; the trace keeps
+  // its two lines so that logs read the same on every platform.
+  log::printf(log::kWarning, "Dictionary = %d", 1);
+  log::printf(log::kWarning, "String = %d", 0);
+}
+
+std::vector<std::string> ClassIndex::getAllLogCodes() const { return codeDictionary.keys(); }
+
+std::vector<std::string> ClassIndex::sectionNames() const {
+  std::vector<std::string> names;
+  names.reserve(classDict.size());
+  for (const auto& entry : classDict) names.push_back(entry.first);
+  return names;
+}
+
+}  // namespace corvane

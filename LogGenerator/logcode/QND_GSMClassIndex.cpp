@@ -1,0 +1,28 @@
+#include "LogGenerator/logcode/QND_GSMClassIndex.h"
+
+#include <cstdio>
+
+#include "LogGenerator/gsm_umts/CellChangeCounters.h"
+#include "LogGenerator/gsm_umts/CodingScheme.h"
+#include "LogGenerator/gsm_umts/PDPContextList.h"
+#include "LogGenerator/gsm_umts/SimInfo.h"
+
+namespace corvane {
+
+QND_GSMClassIndex::QND_GSMClassIndex() {
+  objCodingScheme = makeSection<CodingScheme>();
+  objPDPContextList = makeSection<PDPContextList>();
+  objCellChangeCounter = makeSection<CellChangeCounters>();
+  objSimInfo = makeSection<SimInfo>();
+}
+
+QND_GSMClassIndex::~QND_GSMClassIndex() {
+  std::puts("Deallocing QND_GSMClassIndex");
+  std::fflush(stdout);
+  objCodingScheme.reset();
+  objPDPContextList.reset();
+  objCellChangeCounter.reset();
+  objSimInfo.reset();
+}
+
+}  // namespace corvane
