@@ -115,8 +115,8 @@ TEST(TechnologyGenerators, TheUtranTemplateIsTheFirstPlistWhoseNameSaysUtranInAn
     EXPECT_EQ(dynamic_cast<UTRANLogGenerator*>(gen.get())->templateName(), "a-utran");
   }
   const std::string out = testing::internal::GetCapturedStdout();
-  EXPECT_NE(std::find(capture.texts().begin(), capture.texts().end(), "Created UTRANLogGenerator object"),
-            capture.texts().end());
+  const auto texts = capture.texts();
+  EXPECT_NE(std::find(texts.begin(), texts.end(), "Created UTRANLogGenerator object"), texts.end());
   // The UTRAN index prints nothing of its own.
   EXPECT_EQ(out, "Deallocing ClassIndex\n");
 }
@@ -130,8 +130,8 @@ TEST(TechnologyGenerators, WithoutAUtranTemplateTheGeneratorStaysEmpty) {
   auto* utran = dynamic_cast<UTRANLogGenerator*>(gen.get());
   ASSERT_NE(utran, nullptr);
   EXPECT_EQ(utran->classIndex(), nullptr);
-  EXPECT_EQ(std::find(capture.texts().begin(), capture.texts().end(), "Created UTRANLogGenerator object"),
-            capture.texts().end());
+  const auto texts = capture.texts();
+  EXPECT_EQ(std::find(texts.begin(), texts.end(), "Created UTRANLogGenerator object"), texts.end());
   const Dictionary command = gen->getStartCommand();
   EXPECT_TRUE(command.find("SetQuendraLogCodes")->asArray()->empty());
   EXPECT_TRUE(command.find("SetTsExtraCodes")->asArray()->empty());
