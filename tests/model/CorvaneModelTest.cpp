@@ -10,6 +10,7 @@
 #include "model/FakeTelephony.h"
 #include "platform/Log.h"
 #include "platform/VirtualRunLoop.h"
+#include "support/Packets.h"
 #include "support/Values.h"
 
 namespace corvane {
@@ -346,6 +347,36 @@ TEST_F(Model, SaveContentsComeFromTheGenerator) {
   const Value contents = model_->getSaveContents();
   ASSERT_TRUE(contents.isArray());
   EXPECT_EQ(contents.asArray()->size(), 1u);
+}
+
+TEST_F(Model, ALogCodeTechnologyStreamsItsCodesAndSavesItsPacketsAsADlf) {
+  service_.technologyReply = FakeTelephony::replyFor("Quendra_LTE");
+  startRunning();
+  const Dictionary& start = *service_.commands.back().command.asDictionary();
+  EXPECT_EQ(*start.find("SetState")->asString(), "Streaming");
+  const auto& extra = start.find("SetTsExtraCodes")->asArray()->elements();
+  EXPECT_NE(std::find(extra.begin(), extra.end(), Value::integer(0)), extra.end());
+  EXPECT_NE(std::find(extra.begin(), extra.end(), Value::integer(2)), extra.end());
+
+  const Bytes sim = test::extraCodePacket(0, test::binaryBytes(D({{"kSimFile_ICCID", S("8901260123456789012")}})));
+  service_.sendPacket(sim);
+  loop_.advanceBy(2s);
+  ASSERT_NE(model_->topLevelNodes(), nullptr);
+  const auto node = model_->nodeAtPath("/SIM Info/EF-ICCID");
+  ASSERT_NE(node, nullptr);
+  ASSERT_NE(node->value(), nullptr);
+  EXPECT_EQ(*node->value(), "8901260123456789012");
+
+  const Value contents = model_->getSaveContents();
+  ASSERT_TRUE(contents.isArray());
+  const Array& entries = *contents.asArray();
+  ASSERT_EQ(entries.size(), 2u);  // one snapshot, then the DLF
+  const Dictionary& dlf = *entries.at(1).asDictionary();
+  const std::size_t expected = 161 + sim.size() - 1;
+  EXPECT_EQ(*dlf.find("Description")->asString(), "DLF binary (" + std::to_string(expected) + " bytes)");
+  const Bytes& bytes = *dlf.find("DLF")->asData();
+  ASSERT_EQ(bytes.size(), expected);
+  EXPECT_EQ(Bytes(bytes.begin() + 161, bytes.end()), Bytes(sim.begin() + 1, sim.end()));
 }
 
 TEST_F(Model, TheHistoryIsKeptAcrossAReconnect) {
