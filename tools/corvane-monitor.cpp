@@ -18,14 +18,10 @@
 #include "CommandLine.h"
 #include "TreePrinter.h"
 #include "model/CorvaneModel.h"
+#include "model/SocketModelEnvironment.h"
 #include "platform/Assertion.h"
 #include "platform/DateText.h"
 #include "platform/Log.h"
-#include "platform/QtRunLoop.h"
-#include "platform/RuntimeDirectory.h"
-#include "platform/SocketMessagePort.h"
-#include "platform/SocketTelephonyClient.h"
-#include "platform/Uuid.h"
 #include "platform/Version.h"
 
 namespace {
@@ -132,16 +128,17 @@ int main(int argc, char** argv) {
   const std::optional<tools::TreeFormat> treeFormat = tools::treeFormatNamed(format);
   if (!treeFormat) return usageError("unknown format \"" + format + "\" (text or json)");
 
-  const RuntimeDirectoryResult directory = prepareRuntimeDirectory();
-  if (!directory) {
-    std::fprintf(stderr, "corvane-monitor: %s\n", directory.error.c_str());
+  QCoreApplication app(argc, argv);
+  std::string error;
+  const std::unique_ptr<SocketModelEnvironment> platform = SocketModelEnvironment::create(error);
+  if (!platform) {
+    std::fprintf(stderr, "corvane-monitor: %s\n", error.c_str());
     return kExitFailure;
   }
   if (logToStderr) {
     tools::copyLogToStandardError();
   }
 
-  QCoreApplication app(argc, argv);
   if (::socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, signalPipe) != 0) {
     std::perror("corvane-monitor: socketpair");
     return kExitFailure;
@@ -152,14 +149,11 @@ int main(int argc, char** argv) {
   std::signal(SIGTERM, onSignal);
   std::signal(SIGPIPE, SIG_IGN);
 
-  QtRunLoop runLoop;
-  SocketPortSystem ports(directory.path);
-  SocketTelephonyClient telephony(ports);
   Monitor monitor(*treeFormat, updates);
   {
-    CorvaneModel model(CorvaneModelEnvironment{runLoop, ports, telephony, &makeUUIDText}, &monitor);
+    CorvaneModel model(platform->environment(), &monitor);
     monitor.setModel(&model);
-    runLoop.dispatchAsync([&model] { model.restartMonitor(); });
+    platform->runLoop().dispatchAsync([&model] { model.restartMonitor(); });
     app.exec();
   }
   return 0;

@@ -1,0 +1,190 @@
+#include "app/CorvaneApp.h"
+
+#include <QDateTime>
+#include <QGuiApplication>
+#include <QIcon>
+#include <QScreen>
+#include <QVBoxLayout>
+
+#include <system_error>
+
+#include "app/Theme.h"
+#include "platform/DateText.h"
+#include "platform/DevicePaths.h"
+
+namespace corvane {
+
+namespace {
+
+const QString kConnecting = QStringLiteral("Connecting");
+const QString kConnectingWithDots = QStringLiteral("Connecting...");
+
+// A phone-like window on a desktop; the whole screen on a screen that small.
+constexpr int kDesktopWidth = 400;
+constexpr int kDesktopHeight = 720;
+constexpr int kPhoneScreenWidth = 600;
+
+const char* const kStyleSheet = R"(
+#NavigationBar { background-color: #f4f6f8; border-bottom: 1px solid #c9cfd6; }
+#Toolbar { background-color: #f4f6f8; border-top: 1px solid #c9cfd6; }
+#NavigationTitle { color: #1b242e; }
+#BackButton, #SaveButton, #CancelSnapshotButton, #SaveSnapshotButton {
+  color: #0b63ce; background: transparent; border: none; padding: 6px 6px; }
+#BackButton:pressed, #SaveButton:pressed, #CancelSnapshotButton:pressed, #SaveSnapshotButton:pressed { color: #6f9fd8; }
+#SaveSnapshotButton { font-weight: bold; }
+QLineEdit { background: #ffffff; border: 1px solid #c9cfd6; border-radius: 8px; padding: 2px 8px; }
+QLineEdit:focus { border: 1px solid #0b63ce; }
+#saveContentTable { border: 1px solid #d5dbe2; border-radius: 8px; background: #ffffff; }
+)";
+
+QIcon applicationIcon() { return QIcon(QStringLiteral(":/corvane/corvane.svg")); }
+
+}  // namespace
+
+QString DateFormatter::stringFromDate(const Date& date) const {
+  return QDateTime::fromMSecsSinceEpoch(date.microsecondsSince1970 / 1000, Qt::LocalTime).toString(_pattern);
+}
+
+CorvaneApp::CorvaneApp(CorvaneAppEnvironment environment) : _environment(std::move(environment)) {}
+
+CorvaneApp::~CorvaneApp() {
+  if (_running) applicationWillTerminate();
+}
+
+std::filesystem::path CorvaneApp::snapshotDirectory() const {
+  return devicePath(kSnapshotDirectoryPath, _environment.deviceRoot);
+}
+
+void CorvaneApp::_setGSMRSSI(bool value) {
+  const QString domain = QString::fromLatin1(kHomeScreenPreferencesDomain);
+  const QString key = QString::fromLatin1(kShowGSMRSSIKey);
+  _environment.preferences.setAppValue(key, value, domain);
+  _environment.preferences.synchronize(domain);
+  _environment.preferences.SendAppPreferencesChanged(domain, key);
+}
+
+void CorvaneApp::getSaveButtonPref() {
+  std::error_code error;
+  _allowSaveButton = std::filesystem::exists(devicePath(kSaveEnablingMarkerPath, _environment.deviceRoot), error);
+}
+
+void CorvaneApp::getRSSIPref() {
+  // Read from this application's domain, written to the home screen's: unless
+  // this application's own domain says true, the numeric display goes on at
+  // every launch.
+  const bool shown = _environment.preferences.getAppBooleanValue(QString::fromLatin1(kShowGSMRSSIKey),
+                                                                 QString::fromLatin1(kAppPreferencesDomain));
+  if (!shown) {
+    _unsetRSSI = true;
+    _setGSMRSSI(true);
+  }
+}
+
+void CorvaneApp::applicationDidFinishLaunching() {
+  if (_running) return;
+  _running = true;
+  getRSSIPref();
+  getSaveButtonPref();
+
+  _window = std::make_unique<QWidget>();
+  _window->setObjectName(QStringLiteral("CorvaneWindow"));
+  _window->setWindowTitle(QStringLiteral("Corvane"));
+  _window->setWindowIcon(applicationIcon());
+  _window->setStyleSheet(QString::fromLatin1(kStyleSheet));
+  const QScreen* screen = QGuiApplication::primaryScreen();
+  const QRect available = screen ? screen->availableGeometry() : QRect(0, 0, kDesktopWidth, kDesktopHeight);
+  if (available.width() <= kPhoneScreenWidth) {
+    _window->setGeometry(available);
+  } else {
+    _window->resize(kDesktopWidth, std::min(kDesktopHeight, std::max(480, available.height() - 40)));
+  }
+
+  _model = std::make_unique<CorvaneModel>(_environment.model, this);
+  _updateMessage = kConnectingWithDots;
+  _dateFormatter = std::make_unique<DateFormatter>(QString::fromLatin1(kUpdatePattern));
+
+  auto* root = new CorvanePaneController(nullptr, "/", *this);
+  root->setStatus(kConnecting, true);
+
+  _navController = new NavigationController(root);
+  _navController->setDelegate(this);
+  auto* layout = new QVBoxLayout(_window.get());
+  layout->setContentsMargins(0, 0, 0, 0);
+  layout->addWidget(_navController);
+  _window->show();
+  _window->activateWindow();
+
+  // The monitor starts once the launch has returned.
+  _environment.model.runLoop.dispatchAsync([self = QPointer<CorvaneApp>(this)] {
+    if (self && self->_model) self->_model->restartMonitor();
+  });
+}
+
+void CorvaneApp::applicationWillTerminate() {
+  if (!_running) return;
+  _running = false;
+  if (_unsetRSSI) _setGSMRSSI(false);
+
+  _updateMessage.clear();
+  _dateFormatter.reset();
+  _saveViewController = nullptr;
+
+  if (_window) _window->hide();
+  _navController = nullptr;
+  _window.reset();
+
+  _model.reset();
+}
+
+void CorvaneApp::showSaveView() {
+  if (_saveViewController || !_navController || !_model) return;
+  _saveViewController =
+      new CorvaneSaveViewController(_model->getSaveContents(), *this, _environment.model.runLoop, snapshotDirectory());
+  _navController->presentModalViewController(_saveViewController, true);
+}
+
+void CorvaneApp::closeSaveView() {
+  if (!_saveViewController || !_navController) return;
+  // The navigation controller deletes the screen it dismisses.
+  _navController->dismissModalViewControllerAnimated(true);
+  _saveViewController = nullptr;
+}
+
+void CorvaneApp::updateStatusForViewController(CorvanePaneController* viewController) {
+  if (!viewController) return;
+  if (_model && _model->isConnected()) {
+    viewController->setStatus(_updateMessage, false);
+  } else {
+    viewController->setStatus(kConnectingWithDots, true);
+  }
+}
+
+void CorvaneApp::updateViewControllerFromModel() {
+  if (!_navController || !_model) return;
+  // A copy: a pop changes the stack during the walk.
+  const std::vector<ViewController*> stack = _navController->viewControllers();
+  for (std::size_t i = 0; i < stack.size(); ++i) {
+    auto* screen = qobject_cast<CorvanePaneController*>(stack[i]);
+    if (!screen) continue;
+    if (i == 0) {
+      screen->reloadWithNode(_model->topLevelNodes());
+      continue;
+    }
+    if (NodeRef node = _model->nodeAtPath(screen->path())) {
+      screen->reloadWithNode(std::move(node));
+    } else {
+      // What this screen showed has gone from the display: back to the screen below.
+      _navController->popToViewController(stack[i - 1], true);
+      break;
+    }
+  }
+  if (_model->isConnected()) _updateMessage = _dateFormatter->stringFromDate(currentDate());
+  updateStatusForViewController(qobject_cast<CorvanePaneController*>(_navController->topViewController()));
+}
+
+void CorvaneApp::navigationControllerWillShowViewController(NavigationController&, ViewController* viewController,
+                                                            bool) {
+  updateStatusForViewController(qobject_cast<CorvanePaneController*>(viewController));
+}
+
+}  // namespace corvane

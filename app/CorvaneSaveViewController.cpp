@@ -1,0 +1,194 @@
+#include "app/CorvaneSaveViewController.h"
+
+#include <QKeyEvent>
+#include <QMessageBox>
+#include <QPointer>
+
+#include <cstdio>
+
+#include "app/Theme.h"
+#include "platform/DateText.h"
+#include "platform/Log.h"
+#include "platform/PropertyList.h"
+#include "ui_CorvaneSaveViewController.h"
+
+namespace corvane {
+
+namespace {
+
+QLabel* styleHeading(QLabel* label) {
+  label->setFont(theme::boldSystemFont(12));
+  QPalette palette = label->palette();
+  palette.setColor(QPalette::WindowText, theme::kSecondaryText);
+  label->setPalette(palette);
+  return label;
+}
+
+// Writes straight into the final file (no temporary file and rename): a
+// snapshot is written once and nothing else reads it while it is written.
+bool writeFile(const std::string& path, const Bytes& bytes) {
+  std::FILE* file = std::fopen(path.c_str(), "wb");
+  if (!file) return false;
+  const bool written = std::fwrite(bytes.data(), 1, bytes.size(), file) == bytes.size();
+  return std::fclose(file) == 0 && written;
+}
+
+}  // namespace
+
+CorvaneSaveViewController::CorvaneSaveViewController(const Value& saveHistory, ScreenHost& application,
+                                                     RunLoop& mainQueue, std::filesystem::path snapshotDirectory)
+    : _timeStamp(currentDate()), _saveHistory(saveHistory.deepCopy()),
+      _ui(std::make_unique<Ui::CorvaneSaveViewController>()), _application(application), _mainQueue(mainQueue),
+      _snapshotDirectory(std::move(snapshotDirectory)) {
+  _ui->setupUi(this);
+  setObjectName(QStringLiteral("CorvaneSaveViewController"));
+  setTitle(_ui->titleLabel->text());
+  viewDidLoad();
+}
+
+CorvaneSaveViewController::~CorvaneSaveViewController() = default;
+
+void CorvaneSaveViewController::viewDidLoad() {
+  connect(_ui->saveDescription, &QLineEdit::returnPressed, this,
+          [this] { textFieldShouldReturn(_ui->saveDescription); });
+  connect(_ui->saveButton, &QPushButton::clicked, this, &CorvaneSaveViewController::savePressed);
+  connect(_ui->cancelButton, &QPushButton::clicked, this, &CorvaneSaveViewController::cancelPressed);
+
+  _ui->header->setObjectName(QStringLiteral("NavigationBar"));
+  _ui->header->setAttribute(Qt::WA_StyledBackground, true);
+  _ui->titleLabel->setFont(theme::boldSystemFont(17));
+  for (QPushButton* button : {_ui->cancelButton, _ui->saveButton}) {
+    button->setFont(theme::systemFont(17));
+    button->setCursor(Qt::PointingHandCursor);
+  }
+  _ui->saveButton->setObjectName(QStringLiteral("SaveSnapshotButton"));
+  _ui->cancelButton->setObjectName(QStringLiteral("CancelSnapshotButton"));
+  styleHeading(_ui->descriptionHeading);
+  styleHeading(_ui->contentsHeading);
+  _ui->saveDescription->setFont(theme::systemFont(15));
+  _ui->saveDescription->setMinimumHeight(36);
+  _ui->destinationLabel->setFont(theme::systemFont(12));
+  QPalette secondary = _ui->destinationLabel->palette();
+  secondary.setColor(QPalette::WindowText, theme::kSecondaryText);
+  _ui->destinationLabel->setPalette(secondary);
+  _ui->destinationLabel->setText(
+      tr("Written to %1 as CorvaneSnapshot-<seconds since 1970>.corvane, an XML property list.")
+          .arg(QString::fromStdString(_snapshotDirectory.string())));
+  _ui->body->setAutoFillBackground(true);
+  QPalette group = _ui->body->palette();
+  group.setColor(QPalette::Window, theme::kGroupBackground);
+  _ui->body->setPalette(group);
+
+  _ui->saveContentTable->setDataSource(this);
+  _ui->saveContentTable->reloadData();
+  _ui->saveContentTable->sizeToFit();
+}
+
+const Array* CorvaneSaveViewController::entries() const { return _saveHistory.asArray(); }
+
+std::string CorvaneSaveViewController::snapshotFileAt(const Date& date) const {
+  // Whole seconds, rounded down also before 1970.
+  std::int64_t seconds = date.microsecondsSince1970 / 1'000'000;
+  if (date.microsecondsSince1970 % 1'000'000 < 0) --seconds;
+  char name[64];
+  std::snprintf(name, sizeof name, "CorvaneSnapshot-%ld.corvane", static_cast<long>(seconds));
+  return _snapshotDirectory.string() + "/" + name;
+}
+
+void CorvaneSaveViewController::savePressed() {
+  // The keys go in this order, and the first value missing ends the dictionary.
+  Dictionary snapshot;
+  snapshot.set("Timestamp", Value(dateText(_timeStamp)));
+  if (!_saveHistory.isNull()) {
+    snapshot.set("Data", _saveHistory);
+    snapshot.set("Description", Value(_ui->saveDescription->text().toStdString()));
+  }
+
+  const std::string file = snapshotFileAt(currentDate());
+  std::string error;
+  const std::optional<Bytes> bytes = plist::serialize(Value(snapshot), plist::Format::XML, &error);
+  if (!bytes || !writeFile(file, *bytes)) {
+    log::printf(log::kError, "Unable to write snapshot to %s", file.c_str());
+    // The alert belongs to the window, so that it stays when this screen closes.
+    QWidget* owner = window() != this ? window() : nullptr;
+    auto* alert = new QMessageBox(QMessageBox::Warning, QStringLiteral("File Error"),
+                                  QStringLiteral("Unable to write file to disk"), QMessageBox::NoButton, owner);
+    alert->setObjectName(QStringLiteral("FileErrorAlert"));
+    alert->addButton(QStringLiteral("Close"), QMessageBox::AcceptRole);
+    alert->setAttribute(Qt::WA_DeleteOnClose);
+    alert->open();
+  }
+  requestClose();
+}
+
+void CorvaneSaveViewController::cancelPressed() { requestClose(); }
+
+void CorvaneSaveViewController::requestClose() {
+  // Later, on the main queue: the button that asked is still on the call stack.
+  _mainQueue.dispatchAsync([self = QPointer<CorvaneSaveViewController>(this)] {
+    if (self) self->_application.closeSaveView();
+  });
+}
+
+bool CorvaneSaveViewController::textFieldShouldReturn(QLineEdit* textField) {
+  textField->clearFocus();
+  return true;
+}
+
+void CorvaneSaveViewController::backgroundTouched() { _ui->saveDescription->clearFocus(); }
+
+void CorvaneSaveViewController::mousePressEvent(QMouseEvent* event) {
+  backgroundTouched();
+  ViewController::mousePressEvent(event);
+}
+
+void CorvaneSaveViewController::keyPressEvent(QKeyEvent* event) {
+  if (event->key() == Qt::Key_Escape) {
+    cancelPressed();
+    return;
+  }
+  ViewController::keyPressEvent(event);
+}
+
+int CorvaneSaveViewController::tableViewNumberOfRowsInSection(TableView&, int) {
+  const Array* list = entries();
+  return list ? static_cast<int>(list->size()) : 0;
+}
+
+TableViewCell* CorvaneSaveViewController::tableViewCellForRowAtIndexPath(TableView& tableView,
+                                                                         const IndexPath& indexPath) {
+  const Array* list = entries();
+  if (!list || indexPath.row < 0 || static_cast<std::size_t>(indexPath.row) >= list->size()) return nullptr;
+  const QString identifier = QString::fromLatin1(kCellIdentifier);
+  TableViewCell* cell = tableView.dequeueReusableCellWithIdentifier(identifier);
+  if (!cell) cell = new TableViewCell(TableViewCell::Style::Default, identifier);
+
+  QString description;
+  const Value& entry = list->at(static_cast<std::size_t>(indexPath.row));
+  if (const Dictionary* dictionary = entry.asDictionary()) {
+    if (const Value* text = dictionary->find("Description"); text && text->asString()) {
+      description = QString::fromStdString(*text->asString());
+    }
+  }
+  QFont font(QStringLiteral("Helvetica"));
+  font.setPixelSize(13);
+  cell->textLabel()->setFont(font);
+  cell->textLabel()->setText(description);
+  // Everything listed is saved; the mark cannot be taken off.
+  cell->setAccessoryType(TableViewCell::AccessoryType::Checkmark);
+  cell->setCursor(Qt::ArrowCursor);
+  return cell;
+}
+
+void CorvaneSaveViewController::tableViewDidSelectRowAtIndexPath(TableView& tableView,
+                                                                 const std::optional<IndexPath>& indexPath) {
+  if (indexPath) tableView.deselectRowAtIndexPath(*indexPath, false);
+  backgroundTouched();
+}
+
+TableView* CorvaneSaveViewController::saveContentTable() const { return _ui->saveContentTable; }
+QLineEdit* CorvaneSaveViewController::saveDescription() const { return _ui->saveDescription; }
+QPushButton* CorvaneSaveViewController::saveButton() const { return _ui->saveButton; }
+QPushButton* CorvaneSaveViewController::cancelButton() const { return _ui->cancelButton; }
+
+}  // namespace corvane

@@ -1,0 +1,144 @@
+#pragma once
+
+// Screens and the stack that holds them. A ViewController is one screen with a
+// title and a toolbar of its own; the NavigationController shows the topmost
+// screen under a bar with its title and a back button, and its toolbar below.
+// One screen at a time can be presented modally over the whole stack.
+//
+// Pushes and pops happen at once whatever `animated` says: nothing waits for
+// an animation, so what a caller sees right after a call is final.
+
+#include <QPointer>
+#include <QWidget>
+
+#include <vector>
+
+class QHBoxLayout;
+class QLabel;
+class QStackedLayout;
+class QStackedWidget;
+class QToolButton;
+
+namespace corvane {
+
+class NavigationController;
+
+// One item of a toolbar: a widget, or a flexible space that takes up what the
+// other items leave.
+struct BarItem {
+  enum class Kind { Widget, FlexibleSpace };
+  Kind kind = Kind::FlexibleSpace;
+  QPointer<QWidget> widget;
+
+  static BarItem item(QWidget* widget) { return BarItem{Kind::Widget, widget}; }
+  static BarItem flexibleSpace() { return BarItem{}; }
+};
+
+class ViewController : public QWidget {
+  Q_OBJECT
+
+ public:
+  explicit ViewController(QWidget* parent = nullptr);
+  ~ViewController() override;
+
+  const QString& title() const { return _title; }
+  void setTitle(const QString& title);
+
+  const std::vector<BarItem>& toolbarItems() const { return _toolbarItems; }
+  // Replaces the toolbar's items; the widgets of the previous items are deleted.
+  void setToolbarItems(std::vector<BarItem> items, bool animated);
+  // The toolbar that shows the items (the navigation controller shows it while
+  // this screen is on top).
+  QWidget* toolbar() const { return _toolbar; }
+
+  // The stack this screen is on (or is presented over); nullptr for none.
+  NavigationController* navigationController() const { return _navigationController; }
+
+  virtual void viewWillAppear(bool animated);
+  virtual void viewWillDisappear(bool animated);
+
+ signals:
+  void titleChanged(const QString& title);
+
+ private:
+  friend class NavigationController;
+
+  QString _title;
+  std::vector<BarItem> _toolbarItems;
+  QPointer<QWidget> _toolbar;
+  QHBoxLayout* _toolbarLayout = nullptr;
+  NavigationController* _navigationController = nullptr;
+};
+
+class NavigationControllerDelegate {
+ public:
+  // Called before `viewController` becomes the visible screen by a push or a pop.
+  virtual void navigationControllerWillShowViewController(NavigationController& navigationController,
+                                                          ViewController* viewController, bool animated) = 0;
+
+ protected:
+  ~NavigationControllerDelegate() = default;
+};
+
+class NavigationController final : public QWidget {
+  Q_OBJECT
+
+ public:
+  // Takes the root screen over; it is never popped.
+  explicit NavigationController(ViewController* rootViewController, QWidget* parent = nullptr);
+  ~NavigationController() override;
+
+  void setDelegate(NavigationControllerDelegate* delegate) { _delegate = delegate; }
+  NavigationControllerDelegate* delegate() const { return _delegate; }
+
+  // Takes the screen over and shows it on top.
+  void pushViewController(ViewController* viewController, bool animated);
+  // Pops the top screen (never the root); the popped screens are deleted.
+  void popViewControllerAnimated(bool animated);
+  // Pops every screen above `viewController`.
+  void popToViewController(ViewController* viewController, bool animated);
+
+  const std::vector<ViewController*>& viewControllers() const { return _viewControllers; }
+  ViewController* topViewController() const { return _viewControllers.back(); }
+
+  void setToolbarHidden(bool hidden);
+  bool isToolbarHidden() const { return _toolbarHidden; }
+
+  // Shows `viewController` over the whole stack (taking it over) until it is dismissed.
+  void presentModalViewController(ViewController* viewController, bool animated);
+  // Takes the presented screen away and deletes it.
+  void dismissModalViewControllerAnimated(bool animated);
+  ViewController* modalViewController() const { return _modalViewController; }
+
+  // What the bar shows: the top screen's title, and the back button's text
+  // (empty when the root is on top).
+  QString barTitle() const;
+  QString backButtonText() const;
+  QToolButton* backButton() const { return _backButton; }
+
+ protected:
+  void showEvent(QShowEvent* event) override;
+
+ private:
+  void willShow(ViewController* viewController, bool animated);
+  void adopt(ViewController* viewController);
+  void release(ViewController* viewController);
+  void updateBar();
+
+  std::vector<ViewController*> _viewControllers;
+  NavigationControllerDelegate* _delegate = nullptr;
+  ViewController* _modalViewController = nullptr;
+  bool _toolbarHidden = true;
+  bool _appeared = false;
+
+  QStackedLayout* _presentation = nullptr;  // the stack's page, or the modal screen
+  QWidget* _stackPage = nullptr;
+  QWidget* _navigationBar = nullptr;
+  QToolButton* _backButton = nullptr;
+  QLabel* _titleLabel = nullptr;
+  QWidget* _titleBalance = nullptr;
+  QStackedWidget* _screens = nullptr;
+  QStackedWidget* _toolbars = nullptr;
+};
+
+}  // namespace corvane

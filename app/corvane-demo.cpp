@@ -1,0 +1,283 @@
+// corvane-demo: Corvane with its telephony service on one desktop. It starts
+// corvane-telephonyd with the built-in simulator in a private runtime
+// directory, then the application with a device root that holds the marker
+// that offers saving, and stops the service (and removes the runtime
+// directory) when the application quits, or when the demo is interrupted.
+
+#include <fcntl.h>
+#include <getopt.h>
+#include <spawn.h>
+#include <sys/stat.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <chrono>
+#include <csignal>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <filesystem>
+#include <string>
+#include <system_error>
+#include <thread>
+#include <vector>
+
+#include "CommandLine.h"
+#include "app/DisplayCheck.h"
+#include "platform/DevicePaths.h"
+#include "platform/Version.h"
+
+extern char** environ;
+
+namespace {
+
+namespace fs = std::filesystem;
+using namespace std::chrono_literals;
+
+constexpr int kExitFailure = 1;
+constexpr auto kServiceStartLimit = 5s;
+constexpr auto kServiceStopLimit = 3s;
+
+constexpr const char* kUsage =
+    "Usage: corvane-demo [--technology NAME] [--seed N] [--device-root DIR]\n";
+
+void printHelp() {
+  std::printf(
+      "%s"
+      "\n"
+      "Starts the telephony service with its built-in simulator and the Corvane\n"
+      "application connected to it. Quitting the application, Ctrl-C or SIGTERM\n"
+      "stop both.\n"
+      "\n"
+      "Options:\n"
+      "  -t, --technology NAME  the simulated baseband (default: IFX)\n"
+      "  -s, --seed N           the simulator's seed (default: 1)\n"
+      "  -d, --device-root DIR  the phone's file system for the application: it\n"
+      "                         holds the marker that offers saving and the\n"
+      "                         snapshots (default: $XDG_STATE_HOME/corvane/demo-device,\n"
+      "                         else ~/.local/state/corvane/demo-device)\n"
+      "  -h, --help             show this help\n"
+      "  -V, --version          show the version\n"
+      "\n"
+      "Needs a display; without one, run it under xvfb-run -a, or use corvane-monitor.\n",
+      kUsage);
+}
+
+int usageError(const std::string& message) { return corvane::tools::usageError("corvane-demo", kUsage, message); }
+
+int fail(const std::string& message) {
+  std::fprintf(stderr, "corvane-demo: %s\n", message.c_str());
+  return kExitFailure;
+}
+
+fs::path defaultDeviceRoot() {
+  const char* state = std::getenv("XDG_STATE_HOME");
+  if (state && *state == '/') return fs::path(state) / "corvane" / "demo-device";
+  const char* home = std::getenv("HOME");
+  return fs::path(home && *home ? home : "/tmp") / ".local" / "state" / "corvane" / "demo-device";
+}
+
+// The programs live next to this one once installed; in the build tree the
+// service is in its own directory.
+fs::path findProgram(const std::string& name, const std::vector<fs::path>& candidates) {
+  for (const fs::path& candidate : candidates) {
+    std::error_code error;
+    if (fs::is_regular_file(candidate, error) && ::access(candidate.c_str(), X_OK) == 0) return candidate;
+  }
+  return name;  // left to PATH
+}
+
+// Starts a program with the termination signals at their defaults and unblocked,
+// and with `extra` ("NAME=value") added to the environment.
+pid_t spawn(const std::vector<std::string>& argv, const std::vector<std::string>& extra, std::string& error) {
+  std::vector<std::string> environment;
+  for (char** entry = environ; *entry; ++entry) {
+    const std::string text = *entry;
+    bool replaced = false;
+    for (const std::string& e : extra) {
+      const std::string prefix = e.substr(0, e.find('=') + 1);  // "NAME="
+      replaced |= text.rfind(prefix, 0) == 0;
+    }
+    if (!replaced) environment.push_back(text);
+  }
+  environment.insert(environment.end(), extra.begin(), extra.end());
+
+  std::vector<char*> args;
+  for (const std::string& a : argv) args.push_back(const_cast<char*>(a.c_str()));
+  args.push_back(nullptr);
+  std::vector<char*> env;
+  for (const std::string& e : environment) env.push_back(const_cast<char*>(e.c_str()));
+  env.push_back(nullptr);
+
+  posix_spawnattr_t attributes;
+  posix_spawnattr_init(&attributes);
+  sigset_t none;
+  sigemptyset(&none);
+  sigset_t defaults;
+  sigemptyset(&defaults);
+  for (int s : {SIGINT, SIGTERM, SIGHUP, SIGCHLD, SIGPIPE}) sigaddset(&defaults, s);
+  posix_spawnattr_setsigmask(&attributes, &none);
+  posix_spawnattr_setsigdefault(&attributes, &defaults);
+  posix_spawnattr_setflags(&attributes, POSIX_SPAWN_SETSIGMASK | POSIX_SPAWN_SETSIGDEF);
+  pid_t pid = -1;
+  const int status = posix_spawnp(&pid, args[0], nullptr, &attributes, args.data(), env.data());
+  posix_spawnattr_destroy(&attributes);
+  if (status != 0) {
+    error = "cannot start " + argv[0] + ": " + std::strerror(status);
+    return -1;
+  }
+  return pid;
+}
+
+int exitStatusOf(int status) {
+  if (WIFEXITED(status)) return WEXITSTATUS(status);
+  if (WIFSIGNALED(status)) return 128 + WTERMSIG(status);
+  return kExitFailure;
+}
+
+// Waits up to `limit` for the process; true when it has ended.
+bool waitFor(pid_t pid, std::chrono::milliseconds limit, int& status) {
+  const auto deadline = std::chrono::steady_clock::now() + limit;
+  for (;;) {
+    const pid_t done = ::waitpid(pid, &status, WNOHANG);
+    if (done == pid || (done < 0 && errno == ECHILD)) return true;
+    if (std::chrono::steady_clock::now() >= deadline) return false;
+    std::this_thread::sleep_for(20ms);
+  }
+}
+
+void stopService(pid_t service) {
+  if (service <= 0) return;
+  int status = 0;
+  ::kill(service, SIGTERM);
+  if (!waitFor(service, kServiceStopLimit, status)) {
+    ::kill(service, SIGKILL);
+    waitFor(service, kServiceStopLimit, status);
+  }
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  std::string technology = "IFX";
+  std::string seed = "1";
+  fs::path root = defaultDeviceRoot();
+
+  static const option kOptions[] = {
+      {"technology", required_argument, nullptr, 't'}, {"seed", required_argument, nullptr, 's'},
+      {"device-root", required_argument, nullptr, 'd'}, {"help", no_argument, nullptr, 'h'},
+      {"version", no_argument, nullptr, 'V'},           {nullptr, 0, nullptr, 0},
+  };
+  opterr = 0;
+  for (;;) {
+    const int c = getopt_long(argc, argv, ":t:s:d:hV", kOptions, nullptr);
+    if (c == -1) break;
+    switch (c) {
+      case 't': technology = optarg; break;
+      case 's': {
+        char* end = nullptr;
+        errno = 0;
+        const unsigned long long value = std::strtoull(optarg, &end, 10);
+        if (errno != 0 || end == optarg || *end != '\0' || optarg[0] == '-') {
+          return usageError(std::string("--seed needs a whole number, not \"") + optarg + "\"");
+        }
+        seed = std::to_string(value);
+        break;
+      }
+      case 'd': root = fs::absolute(optarg); break;
+      case 'h': printHelp(); return 0;
+      case 'V': std::printf("corvane-demo %s\n", corvane::kVersion); return 0;
+      case ':': return usageError(std::string("option ") + argv[optind - 1] + " needs a value");
+      default: return usageError(std::string("unknown option ") + argv[optind - 1]);
+    }
+  }
+  if (optind < argc) return usageError(std::string("unexpected argument \"") + argv[optind] + "\"");
+
+  if (!corvane::displayAvailable()) return fail(corvane::noDisplayMessage("corvane-demo"));
+
+  std::error_code error;
+  const fs::path marker = corvane::devicePath(corvane::kSaveEnablingMarkerPath, root);
+  const fs::path snapshots = corvane::devicePath(corvane::kSnapshotDirectoryPath, root);
+  fs::create_directories(marker, error);
+  if (!error) fs::create_directories(snapshots, error);
+  if (error) return fail("cannot prepare the device root " + root.string() + ": " + error.message());
+
+  char runtimeTemplate[] = "/tmp/corvane-demo-XXXXXX";
+  if (!::mkdtemp(runtimeTemplate)) return fail(std::string("cannot make a runtime directory: ") + std::strerror(errno));
+  const fs::path runtime = runtimeTemplate;
+
+  // The termination signals and the children's ends are taken in turn below.
+  sigset_t watched;
+  sigemptyset(&watched);
+  for (int s : {SIGINT, SIGTERM, SIGHUP, SIGCHLD}) sigaddset(&watched, s);
+  sigprocmask(SIG_BLOCK, &watched, nullptr);
+
+  const fs::path self = fs::read_symlink("/proc/self/exe", error).parent_path();
+  const fs::path serviceProgram =
+      findProgram("corvane-telephonyd", {self / "corvane-telephonyd", self.parent_path() / "telephonyd" / "corvane-telephonyd"});
+  const fs::path appProgram = findProgram("corvane", {self / "corvane"});
+  const std::vector<std::string> environment{"CORVANE_RUNTIME_DIR=" + runtime.string(),
+                                             "CORVANE_DEVICE_ROOT=" + root.string()};
+
+  const auto cleanUp = [&](pid_t service) {
+    stopService(service);
+    fs::remove_all(runtime, error);
+  };
+
+  std::string spawnError;
+  const pid_t service = spawn({serviceProgram.string(), "--technology", technology, "--seed", seed}, environment,
+                              spawnError);
+  if (service < 0) {
+    cleanUp(-1);
+    return fail(spawnError);
+  }
+  // The application connects at once when the service is up first (else it would retry 5 s later).
+  const fs::path serviceSocket = runtime / "corvane-telephonyd.sock";
+  const auto deadline = std::chrono::steady_clock::now() + kServiceStartLimit;
+  int status = 0;
+  while (!fs::exists(serviceSocket, error)) {
+    if (::waitpid(service, &status, WNOHANG) == service) {
+      fs::remove_all(runtime, error);
+      return fail("the telephony service stopped at once (status " + std::to_string(exitStatusOf(status)) + ")");
+    }
+    if (std::chrono::steady_clock::now() >= deadline) {
+      cleanUp(service);
+      return fail("the telephony service did not start within 5 s");
+    }
+    std::this_thread::sleep_for(20ms);
+  }
+
+  const pid_t app = spawn({appProgram.string()}, environment, spawnError);
+  if (app < 0) {
+    cleanUp(service);
+    return fail(spawnError);
+  }
+  std::printf("corvane-demo: Corvane and the %s simulator (seed %s) are running; Ctrl-C stops both.\n"
+              "corvane-demo: snapshots are saved in %s\n",
+              technology.c_str(), seed.c_str(), snapshots.c_str());
+  std::fflush(stdout);
+
+  bool serviceRunning = true;
+  bool stopping = false;
+  int appStatus = 0;
+  for (;;) {
+    siginfo_t info;
+    const int signal = ::sigwaitinfo(&watched, &info);
+    if (signal < 0) continue;
+    if (signal == SIGCHLD) {
+      if (serviceRunning && ::waitpid(service, &status, WNOHANG) == service) {
+        serviceRunning = false;
+        std::fprintf(stderr, "corvane-demo: the telephony service stopped (status %d)\n", exitStatusOf(status));
+      }
+      if (::waitpid(app, &appStatus, WNOHANG) == app) break;
+      continue;
+    }
+    // A second request does not wait for the application any longer.
+    ::kill(app, stopping ? SIGKILL : SIGTERM);
+    stopping = true;
+  }
+
+  cleanUp(serviceRunning ? service : -1);
+  return stopping ? 0 : exitStatusOf(appStatus);
+}

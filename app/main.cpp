@@ -1,0 +1,83 @@
+// corvane: the application. It shows what the phone's baseband reports, as a
+// drill-down tree of list screens, from the telephony service's log channel.
+// It takes no arguments of its own (Qt's own, such as -platform, are Qt's).
+
+#include <QApplication>
+#include <QMessageBox>
+#include <QSocketNotifier>
+
+#include <csignal>
+#include <cstdio>
+#include <memory>
+#include <string>
+#include <sys/socket.h>
+#include <unistd.h>
+
+#include "app/CorvaneApp.h"
+#include "app/DisplayCheck.h"
+#include "app/Preferences.h"
+#include "model/SocketModelEnvironment.h"
+#include "platform/Assertion.h"
+#include "platform/DevicePaths.h"
+
+namespace {
+
+constexpr int kExitFailure = 1;
+constexpr int kExitUsage = 2;
+
+// SIGINT and SIGTERM end the event loop through a socket pair, so that the
+// application terminates as it does when its window closes: the status-bar
+// preference goes back and the model tears its ports down.
+int signalPipe[2] = {-1, -1};
+void onSignal(int) {
+  const char c = 1;
+  [[maybe_unused]] const auto n = ::write(signalPipe[1], &c, 1);
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  using namespace corvane;
+  installTerminateHandler();
+
+  if (!displayAvailable()) {
+    std::fprintf(stderr, "corvane: %s\n", noDisplayMessage("corvane").c_str());
+    return kExitFailure;
+  }
+
+  QApplication application(argc, argv);
+  QApplication::setApplicationName(QStringLiteral("corvane"));
+  QApplication::setApplicationDisplayName(QStringLiteral("Corvane"));
+  QGuiApplication::setDesktopFileName(QStringLiteral("corvane"));
+  if (application.arguments().size() > 1) {
+    std::fprintf(stderr, "corvane: takes no arguments (got \"%s\")\n",
+                 application.arguments().at(1).toLocal8Bit().constData());
+    return kExitUsage;
+  }
+
+  if (::socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, signalPipe) != 0) {
+    std::perror("corvane: socketpair");
+    return kExitFailure;
+  }
+  QSocketNotifier signalNotifier(signalPipe[0], QSocketNotifier::Read);
+  QObject::connect(&signalNotifier, &QSocketNotifier::activated, &application, [] { QCoreApplication::quit(); });
+  std::signal(SIGINT, onSignal);
+  std::signal(SIGTERM, onSignal);
+  std::signal(SIGPIPE, SIG_IGN);
+
+  std::string error;
+  const std::unique_ptr<SocketModelEnvironment> platform = SocketModelEnvironment::create(error);
+  if (!platform) {
+    std::fprintf(stderr, "corvane: %s\n", error.c_str());
+    QMessageBox::critical(nullptr, QStringLiteral("Corvane"),
+                          QStringLiteral("Corvane cannot reach the telephony service: %1").arg(QString::fromStdString(error)));
+    return kExitFailure;
+  }
+
+  Preferences preferences;
+  CorvaneApp corvane(CorvaneAppEnvironment{platform->environment(), preferences, deviceRoot()});
+  QObject::connect(&application, &QCoreApplication::aboutToQuit, &corvane,
+                   [&corvane] { corvane.applicationWillTerminate(); });
+  corvane.applicationDidFinishLaunching();
+  return application.exec();
+}
