@@ -59,13 +59,6 @@ IFXSimulator::IFXSimulator(std::uint64_t seed, std::chrono::nanoseconds packetIn
 
 std::string_view IFXSimulator::technology() const { return kLogChannelTechnologyIFX; }
 
-int IFXSimulator::uniform(int low, int high) {
-  // The standard distributions differ between libraries; this mapping is the
-  // same everywhere, so a seed means the same scenario on every build.
-  const auto span = static_cast<std::uint64_t>(high - low + 1);
-  return low + static_cast<int>(random_() % span);
-}
-
 void IFXSimulator::advance() {
   ++period_;
   serving_.rxLev = std::clamp(serving_.rxLev + uniform(-2, 2), 10, 55);

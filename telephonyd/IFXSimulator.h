@@ -14,10 +14,10 @@
 
 #include <chrono>
 #include <cstdint>
-#include <random>
 #include <vector>
 
 #include "telephonyd/PacketSource.h"
+#include "telephonyd/SeededRandom.h"
 
 namespace corvane::telephonyd {
 
@@ -48,10 +48,10 @@ class IFXSimulator final : public PacketSource {
   };
 
   void advance();
-  int uniform(int low, int high);  // inclusive, from the seeded generator only
+  int uniform(int low, int high) { return random_.uniform(low, high); }
   Dictionary cellFields(const Cell& cell) const;
 
-  std::mt19937_64 random_;
+  SeededRandom random_;
   std::chrono::nanoseconds packetInterval_;
   std::uint64_t packetIndex_ = 0;
   std::uint64_t period_ = 0;

@@ -14,6 +14,9 @@ namespace corvane::telephonyd {
 
 namespace {
 
+// Far enough for any capture, and far from overflowing a microsecond count.
+constexpr std::uint64_t kLatestClockStart = 100'000'000'000;  // in the year 5138
+
 ParsedOptions failure(std::string error) {
   ParsedOptions parsed;
   parsed.exit = true;
@@ -55,21 +58,29 @@ std::string serviceUsage() {
          "  -s, --seed N           seed of the simulated scenario (default 1)\n"
          "  -r, --rate N           packets per second; 0 or \"max\": as fast as clients read (default 2)\n"
          "  -n, --packets N        stop sending to a channel after N packets (default: no limit)\n"
+         "      --clock-start S    start the simulated clock of the log-code technologies'\n"
+         "                         packet timestamps at S seconds since 1970-01-01 UTC\n"
+         "                         (default: the time the service starts)\n"
          "      --log-stderr       copy log lines to standard error\n"
          "  -h, --help             show this help and exit\n"
          "  -V, --version          show the version and exit\n"
+         "\n"
+         "IFX streams property-list reports. Quendra_GSM, Quendra_LTE and Quendra_UTRAN2\n"
+         "stream log records, only the codes that a channel's start command asks for:\n"
+         "so far the extra codes 0 (SIM files), 1 (cell list) and 2 (PDP contexts).\n"
          "\n"
          "Sockets live in $CORVANE_RUNTIME_DIR, else $XDG_RUNTIME_DIR/corvane, else /tmp/corvane-$UID.\n"
          "SIGTERM or SIGINT stop the service and remove its sockets.\n";
 }
 
 ParsedOptions parseServiceOptions(int argc, char** argv) {
-  enum { kLogStderr = 1000 };
+  enum { kLogStderr = 1000, kClockStart };
   static const option kLongOptions[] = {
       {"technology", required_argument, nullptr, 't'}, {"seed", required_argument, nullptr, 's'},
       {"rate", required_argument, nullptr, 'r'},       {"packets", required_argument, nullptr, 'n'},
-      {"log-stderr", no_argument, nullptr, kLogStderr}, {"help", no_argument, nullptr, 'h'},
-      {"version", no_argument, nullptr, 'V'},          {nullptr, 0, nullptr, 0}};
+      {"log-stderr", no_argument, nullptr, kLogStderr}, {"clock-start", required_argument, nullptr, kClockStart},
+      {"help", no_argument, nullptr, 'h'},             {"version", no_argument, nullptr, 'V'},
+      {nullptr, 0, nullptr, 0}};
 
   ParsedOptions parsed;
   // getopt keeps its state in globals: start afresh, and report errors ourselves.
@@ -97,6 +108,15 @@ ParsedOptions parseServiceOptions(int argc, char** argv) {
           return failure("invalid packet count '" + std::string(optarg) + "'");
         }
         break;
+      case kClockStart: {
+        std::uint64_t seconds = 0;
+        // Microseconds since 1970 must fit the 64-bit timestamp for a long while yet.
+        if (!parseUnsigned(optarg, seconds) || seconds > kLatestClockStart) {
+          return failure("invalid clock start '" + std::string(optarg) + "': give seconds since 1970-01-01 UTC");
+        }
+        parsed.options.clockStart = seconds;
+        break;
+      }
       case kLogStderr:
         parsed.options.logToStandardError = true;
         break;

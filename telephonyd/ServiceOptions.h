@@ -3,6 +3,7 @@
 // The command line of corvane-telephonyd.
 
 #include <cstdint>
+#include <optional>
 #include <string>
 
 namespace corvane::telephonyd {
@@ -14,6 +15,9 @@ struct ServiceOptions {
   double rate = 2.0;
   // Packets per channel before the service stops sending to it; 0 for no limit.
   std::uint64_t packetLimit = 0;
+  // Log-code scenarios: seconds since 1970-01-01 UTC on the simulated clock
+  // when the scenario starts; none for the time the service starts.
+  std::optional<std::uint64_t> clockStart;
   bool logToStandardError = false;
 };
 

@@ -17,6 +17,7 @@
 #include "platform/SocketTelephonyClient.h"
 #include "platform/Version.h"
 #include "telephonyd/IFXSimulator.h"
+#include "telephonyd/LogCodeSimulator.h"
 #include "telephonyd/ServiceOptions.h"
 #include "telephonyd/TelephonyService.h"
 
@@ -41,6 +42,12 @@ std::unique_ptr<PacketSource> makeSimulator(const ServiceOptions& options, std::
           ? std::chrono::duration_cast<std::chrono::nanoseconds>(std::chrono::duration<double>(1.0 / options.rate))
           : std::chrono::nanoseconds(kFullSpeedPacketInterval);
   if (options.technology == kLogChannelTechnologyIFX) return std::make_unique<IFXSimulator>(options.seed, interval);
+  const std::uint64_t clockStart =
+      options.clockStart ? *options.clockStart * 1'000'000
+                         : static_cast<std::uint64_t>(std::chrono::duration_cast<std::chrono::microseconds>(
+                                                          std::chrono::system_clock::now().time_since_epoch())
+                                                          .count());
+  if (auto scenario = makeLogCodeScenario(options.technology, options.seed, clockStart)) return scenario;
   error = "no simulator scenario for technology " + options.technology + " yet";
   return nullptr;
 }

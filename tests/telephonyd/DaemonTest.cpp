@@ -319,9 +319,9 @@ TEST_F(DaemonTest, BadOptionExitsWithStatus2AndOneLine) {
 }
 
 TEST_F(DaemonTest, TechnologyWithoutAScenarioIsAClearError) {
-  const auto result = test::runProcess({kDaemon, "--technology", "Quendra_GSM"});
+  const auto result = test::runProcess({kDaemon, "--technology", "Quendra_CDMA"});
   EXPECT_EQ(result.exitCode, 1);
-  EXPECT_EQ(result.err, "corvane-telephonyd: no simulator scenario for technology Quendra_GSM yet\n");
+  EXPECT_EQ(result.err, "corvane-telephonyd: no simulator scenario for technology Quendra_CDMA yet\n");
 }
 
 TEST_F(DaemonTest, UnusableRuntimeDirectoryExitsWithStatus1AndOneLine) {

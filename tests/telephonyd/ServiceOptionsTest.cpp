@@ -23,15 +23,18 @@ TEST(ServiceOptionsTest, DefaultsSimulateIFXAtTwoPacketsPerSecond) {
   EXPECT_EQ(parsed.options.seed, 1u);
   EXPECT_EQ(parsed.options.rate, 2.0);
   EXPECT_EQ(parsed.options.packetLimit, 0u);
+  EXPECT_FALSE(parsed.options.clockStart);
 }
 
 TEST(ServiceOptionsTest, ValuesAreRead) {
-  const ParsedOptions parsed = parse({"--technology", "Quendra_LTE", "--seed=99", "-r", "250.5", "--packets", "10"});
+  const ParsedOptions parsed = parse(
+      {"--technology", "Quendra_LTE", "--seed=99", "-r", "250.5", "--packets", "10", "--clock-start", "1800000000"});
   EXPECT_FALSE(parsed.exit) << parsed.error;
   EXPECT_EQ(parsed.options.technology, "Quendra_LTE");
   EXPECT_EQ(parsed.options.seed, 99u);
   EXPECT_EQ(parsed.options.rate, 250.5);
   EXPECT_EQ(parsed.options.packetLimit, 10u);
+  EXPECT_EQ(parsed.options.clockStart, 1'800'000'000u);
 }
 
 TEST(ServiceOptionsTest, MaxAndZeroRateMeanFullSpeed) {
@@ -42,7 +45,8 @@ TEST(ServiceOptionsTest, MaxAndZeroRateMeanFullSpeed) {
 TEST(ServiceOptionsTest, BadInputExitsWithStatus2AndOneLine) {
   const std::vector<std::vector<std::string>> bad = {
       {"--bogus"}, {"--seed", "x"}, {"--seed", "-3"}, {"--rate", "fast"}, {"--rate", "-1"},
-      {"--rate"},  {"extra"},       {"--technology", "Nope"}};
+      {"--rate"},  {"extra"},       {"--technology", "Nope"}, {"--clock-start", "soon"},
+      {"--clock-start", "100000000001"}};
   for (const auto& arguments : bad) {
     const ParsedOptions parsed = parse(arguments);
     EXPECT_TRUE(parsed.exit) << arguments[0];
@@ -51,6 +55,8 @@ TEST(ServiceOptionsTest, BadInputExitsWithStatus2AndOneLine) {
     EXPECT_EQ(parsed.error.find('\n'), std::string::npos);
   }
   EXPECT_EQ(parse({"--bogus"}).error, "unknown option '--bogus' (see --help)");
+  EXPECT_EQ(parse({"--clock-start", "-1"}).error,
+            "invalid clock start '-1': give seconds since 1970-01-01 UTC (see --help)");
   EXPECT_EQ(parse({"--technology", "Nope"}).error,
             "unknown technology 'Nope' (known: IFX, Quendra_GSM, Quendra_CDMA, Quendra_LTE, Quendra_UTRAN2) "
             "(see --help)");

@@ -1,0 +1,406 @@
+#include "telephonyd/SimulatedNetwork.h"
+
+#include <algorithm>
+#include <stdexcept>
+
+#include "platform/CellMonitor.h"
+#include "platform/LogChannelTechnology.h"
+
+namespace corvane::telephonyd {
+
+namespace {
+
+constexpr int kHandoverMargin = 6;     // dB a neighbour must lead by ...
+constexpr int kHandoverSteps = 3;      // ... for this many steps in a row
+constexpr int kUnmeasuredOneIn = 20;   // chance of a neighbour going unmeasured in a step
+constexpr int kImsToggleOneIn = 60;    // chance per step that the IMS context comes or goes
+// Below this UMTS level the GSM/UMTS phone falls back to GSM; above the other it returns.
+constexpr int kUmtsFallbackLevel = -105;
+constexpr int kUmtsReturnLevel = -95;
+
+struct LevelRange {
+  int low;
+  int high;
+};
+
+LevelRange levelRange(SimulatedNetwork::Access access) {
+  switch (access) {
+    case SimulatedNetwork::Access::GSM: return {-110, -48};
+    case SimulatedNetwork::Access::LTE: return {-100, -40};
+    case SimulatedNetwork::Access::UMTS:
+    case SimulatedNetwork::Access::UTRAN2: return {-120, -50};
+  }
+  return {-120, -40};
+}
+
+// GSM RSSI and LTE RSSI are reported in units of 2 dB, so their levels move in whole units.
+bool hasEvenLevel(SimulatedNetwork::Access access) {
+  return access == SimulatedNetwork::Access::GSM || access == SimulatedNetwork::Access::LTE;
+}
+
+std::string_view accessValue(SimulatedNetwork::Access access) {
+  switch (access) {
+    case SimulatedNetwork::Access::GSM: return CellMonitorRadioAccessTechnologyGSM;
+    case SimulatedNetwork::Access::UMTS: return CellMonitorRadioAccessTechnologyUMTS;
+    case SimulatedNetwork::Access::UTRAN2: return CellMonitorRadioAccessTechnologyUTRAN2;
+    case SimulatedNetwork::Access::LTE: return CellMonitorRadioAccessTechnologyLTE;
+  }
+  return {};
+}
+
+std::string hex(std::uint64_t value, int bytes) {
+  static const char* digits = "0123456789ABCDEF";
+  std::string out;
+  for (int i = bytes * 2 - 1; i >= 0; --i) out += digits[(value >> (4 * i)) & 0xF];
+  return out;
+}
+
+std::string digitString(SeededRandom& random, int count) {
+  std::string out;
+  for (int i = 0; i < count; ++i) out += static_cast<char>('0' + random.uniform(0, 9));
+  return out;
+}
+
+char luhnCheckDigit(std::string_view digits) {
+  int sum = 0;
+  bool doubled = true;  // the check digit will stand to the right
+  for (auto it = digits.rbegin(); it != digits.rend(); ++it) {
+    int d = *it - '0';
+    if (doubled) d = d * 2 > 9 ? d * 2 - 9 : d * 2;
+    sum += d;
+    doubled = !doubled;
+  }
+  return static_cast<char>('0' + (10 - sum % 10) % 10);
+}
+
+// The PLMN identity as the SIM stores it: MCC and MNC digits in swapped BCD,
+// with F for the missing third MNC digit.
+std::string plmnIdentity(int mcc, int mnc) {
+  const int d1 = mcc / 100, d2 = mcc / 10 % 10, d3 = mcc % 10;
+  const int m1 = mnc / 10 % 10, m2 = mnc % 10;
+  return hex(static_cast<std::uint64_t>((d2 << 4 | d1) << 16 | (0xF << 4 | d3) << 8 | (m2 << 4 | m1)), 3);
+}
+
+// A network name element of EF-PNN: tag, length, coding (GSM default alphabet,
+// number of spare bits in the last octet) and the name packed in 7-bit characters.
+std::string networkNameElement(int tag, std::string_view name) {
+  std::string packed;
+  std::uint32_t pending = 0;
+  int bits = 0;
+  for (char c : name) {
+    pending |= static_cast<std::uint32_t>(c & 0x7F) << bits;
+    bits += 7;
+    while (bits >= 8) {
+      packed += hex(pending & 0xFF, 1);
+      pending >>= 8;
+      bits -= 8;
+    }
+  }
+  if (bits > 0) packed += hex(pending & 0xFF, 1);
+  const int spareBits = bits > 0 ? 8 - bits : 0;
+  const auto octets = static_cast<std::uint64_t>(packed.size() / 2);
+  const auto coding = 0x80u | static_cast<unsigned>(spareBits);
+  return hex(static_cast<std::uint64_t>(tag), 1) + hex(octets + 1, 1) + hex(coding, 1) + packed;
+}
+
+std::string number(long long value) { return std::to_string(value); }
+
+}  // namespace
+
+SimulatedNetwork::SimulatedNetwork(std::string_view technology, std::uint64_t seed) : random_(seed) {
+  const int areaCode = random_.uniform(0x1000, 0x7FFF);
+  if (technology == kLogChannelTechnologyQuendraGSM) {
+    addCells(Access::UMTS, 5, areaCode);
+    addCells(Access::GSM, 4, areaCode);
+  } else if (technology == kLogChannelTechnologyQuendraUTRAN2) {
+    addCells(Access::UTRAN2, 5, areaCode);
+    addCells(Access::GSM, 3, areaCode);
+  } else if (technology == kLogChannelTechnologyQuendraLTE) {
+    addCells(Access::LTE, 6, areaCode);
+  } else {
+    throw std::invalid_argument("no simulated network for technology " + std::string(technology));
+  }
+  cells_[serving_].serving = true;
+
+  imsi_ = "00101" + digitString(random_, 10);
+  iccid_ = "8900101" + digitString(random_, 11);
+  iccid_ += luhnCheckDigit(iccid_);
+  const std::string area = number(random_.uniform(201, 989));
+  msisdn_ = "+1" + area + "55501" + digitString(random_, 2);
+  mailbox_ = "+1" + area + "5550100";
+  tmsi_ = static_cast<std::uint32_t>(random_.uniform(0, 0x3FFFFFFF));
+  ptmsi_ = 0xC0000000u | static_cast<std::uint32_t>(random_.uniform(0, 0x3FFFFFFF));
+  ptmsiSignature_ = static_cast<std::uint32_t>(random_.uniform(0, 0xFFFFFF));
+  routingAreaCode_ = random_.uniform(1, 254);
+  internetAddress_ = "10." + number(random_.uniform(0, 255)) + "." + number(random_.uniform(0, 255)) + "." +
+                     number(random_.uniform(1, 254));
+}
+
+void SimulatedNetwork::addCells(Access access, int count, int areaCode) {
+  std::vector<int> channels;  // the carriers of this access technology, the first one the serving cell's
+  std::vector<int> bands;
+  switch (access) {
+    case Access::GSM: {
+      // GSM 900, a few channels apart as a planner would set them.
+      int arfcn = random_.uniform(1, 40);
+      for (int i = 0; i < count; ++i) {
+        channels.push_back(arfcn);
+        bands.push_back(0);
+        arfcn += random_.uniform(3, 11);
+      }
+      break;
+    }
+    case Access::UMTS: {
+      // Two 5 MHz carriers of band 1.
+      const int carrier = random_.uniform(10562, 10813);
+      for (int i = 0; i < count; ++i) {
+        channels.push_back(i > 0 && random_.oneIn(3) ? carrier + 25 : carrier);
+        bands.push_back(1);
+      }
+      break;
+    }
+    case Access::UTRAN2: {
+      // Two 1.6 MHz carriers of band 34 or band 39.
+      const bool band34 = random_.oneIn(2);
+      const int carrier = band34 ? random_.uniform(10054, 10113) : random_.uniform(9404, 9588);
+      for (int i = 0; i < count; ++i) {
+        channels.push_back(i > 0 && random_.oneIn(3) ? carrier + 8 : carrier);
+        bands.push_back(band34 ? 34 : 39);
+      }
+      break;
+    }
+    case Access::LTE: {
+      // Band 3 for the serving carrier and its intra-frequency neighbours; one
+      // neighbour each on band 7 and band 20.
+      const int carrier = random_.uniform(1200, 1949);
+      for (int i = 0; i < count; ++i) {
+        if (i == count - 2) {
+          channels.push_back(random_.uniform(2750, 3449));
+          bands.push_back(7);
+        } else if (i == count - 1) {
+          channels.push_back(random_.uniform(6150, 6449));
+          bands.push_back(20);
+        } else {
+          channels.push_back(carrier);
+          bands.push_back(3);
+        }
+      }
+      break;
+    }
+  }
+
+  const int codeLimit = access == Access::UMTS ? 511 : access == Access::UTRAN2 ? 127 : 503;
+  const int controller = random_.uniform(1, 4095);  // RNC of the UMTS/UTRAN2 cells, most of them
+  const LevelRange range = levelRange(access);
+  const bool first = cells_.empty();
+  for (int i = 0; i < count; ++i) {
+    Cell cell;
+    cell.access = access;
+    // Most cells share the registered area; some lie across its border.
+    cell.areaCode = random_.oneIn(4) ? areaCode + random_.uniform(1, 9) : areaCode;
+    if (first && i == 0) cell.areaCode = areaCode;
+    cell.channel = channels[static_cast<std::size_t>(i)];
+    cell.band = bands[static_cast<std::size_t>(i)];
+    switch (access) {
+      case Access::GSM: cell.cellId = random_.uniform(1, 65535); break;
+      case Access::UMTS:
+      case Access::UTRAN2:
+        cell.cellId = (random_.oneIn(5) ? random_.uniform(1, 4095) : controller) << 16 | random_.uniform(1, 65535);
+        break;
+      case Access::LTE: cell.cellId = random_.uniform(1, 0xFFFFF) << 8 | random_.uniform(1, 3); break;
+    }
+    if (access != Access::GSM) {
+      // Distinct codes among the cells of one access technology, as planning requires.
+      for (;;) {
+        cell.code = random_.uniform(0, codeLimit);
+        const bool taken = std::any_of(cells_.begin(), cells_.end(),
+                                       [&](const Cell& c) { return c.access == access && c.code == cell.code; });
+        if (!taken) break;
+      }
+    }
+    if (first && i == 0) {
+      cell.level = random_.uniform(range.high - 35, range.high - 20);
+    } else {
+      const int reference = first ? cells_.front().level : random_.uniform(range.low + 25, range.high - 20);
+      cell.level = std::clamp(reference - random_.uniform(3, 20), range.low, range.high);
+    }
+    if (hasEvenLevel(access)) cell.level -= cell.level % 2;
+    cell.quality = std::clamp((cell.level + 60) / 4 - 2, -24, 0);
+    cells_.push_back(cell);
+  }
+}
+
+void SimulatedNetwork::drift(Cell& cell) {
+  const LevelRange range = levelRange(cell.access);
+  const int stepSize = hasEvenLevel(cell.access) ? 2 * random_.uniform(-1, 1) : random_.uniform(-2, 2);
+  cell.level = std::clamp(cell.level + stepSize, range.low, range.high);
+  if (cell.access == Access::UMTS || cell.access == Access::UTRAN2) {
+    // Ec/N0 follows the level, with some noise.
+    cell.quality = std::clamp((cell.level + 60) / 4 - 2 + random_.uniform(-1, 1), -24, 0);
+  }
+  cell.measured = cell.serving || !random_.oneIn(kUnmeasuredOneIn);
+}
+
+std::size_t SimulatedNetwork::strongest(Access access) const {
+  std::size_t best = cells_.size();
+  for (std::size_t i = 0; i < cells_.size(); ++i) {
+    const Cell& cell = cells_[i];
+    if (cell.access != access || !cell.measured) continue;
+    if (best == cells_.size() || cell.level > cells_[best].level) best = i;
+  }
+  return best;
+}
+
+void SimulatedNetwork::changeServingCell(std::size_t to) {
+  Cell& from = cells_[serving_];
+  from.serving = false;
+  if (cells_[to].areaCode != from.areaCode) {
+    // A location update in the new area: the network hands out new temporary identities.
+    tmsi_ = static_cast<std::uint32_t>(random_.uniform(0, 0x3FFFFFFF));
+    ptmsi_ = 0xC0000000u | static_cast<std::uint32_t>(random_.uniform(0, 0x3FFFFFFF));
+    ptmsiSignature_ = static_cast<std::uint32_t>(random_.uniform(0, 0xFFFFFF));
+  }
+  serving_ = to;
+  cells_[to].serving = true;
+  cells_[to].measured = true;
+  for (Cell& cell : cells_) cell.strongerSteps = 0;
+  ++cellChanges_;
+}
+
+void SimulatedNetwork::step() {
+  ++steps_;
+  for (Cell& cell : cells_) drift(cell);
+  const Cell& serving = cells_[serving_];
+  for (Cell& cell : cells_) {
+    const bool clearlyStronger = !cell.serving && cell.measured && cell.access == serving.access &&
+                                 cell.level >= serving.level + kHandoverMargin;
+    cell.strongerSteps = clearlyStronger ? cell.strongerSteps + 1 : 0;
+  }
+  const std::size_t best = strongest(serving.access);
+  if (best != serving_ && best < cells_.size() && cells_[best].strongerSteps >= kHandoverSteps) {
+    changeServingCell(best);
+  } else if (serving.access == Access::UMTS && serving.level < kUmtsFallbackLevel) {
+    const std::size_t gsm = strongest(Access::GSM);
+    if (gsm < cells_.size()) changeServingCell(gsm);
+  } else if (serving.access == Access::GSM) {
+    const std::size_t umts = strongest(Access::UMTS);
+    if (umts < cells_.size() && cells_[umts].level > kUmtsReturnLevel) changeServingCell(umts);
+  }
+
+  if (random_.oneIn(kImsToggleOneIn)) {
+    imsActive_ = !imsActive_;
+    if (imsActive_) {
+      imsAddress_ = "2001:db8:" + hex(static_cast<std::uint64_t>(random_.uniform(0, 0xFFFF)), 2) + ":" +
+                    hex(static_cast<std::uint64_t>(random_.uniform(0, 0xFFFF)), 2) + "::" +
+                    hex(static_cast<std::uint64_t>(random_.uniform(1, 0xFFFF)), 2);
+    }
+    ++pdpGeneration_;
+  }
+}
+
+Dictionary SimulatedNetwork::cellFields(const Cell& cell) const {
+  Dictionary fields;
+  auto measuredValue = [&](int value) { return Value::integer(cell.measured ? value : kCellMonitorNotMeasured); };
+  fields.set(CellMonitorCellRadioAccessTechnology, Value(accessValue(cell.access)));
+  fields.set(CellMonitorCellType, Value(cell.serving ? CellMonitorCellTypeServing : CellMonitorCellTypeNeighbor));
+  fields.set(CellMonitorMCC, Value::integer(kMobileCountryCode));
+  fields.set(CellMonitorMNC, Value::integer(kMobileNetworkCode));
+  switch (cell.access) {
+    case Access::GSM:
+      fields.set(CellMonitorLAC, Value::integer(cell.areaCode));
+      fields.set(CellMonitorCellId, Value::integer(cell.cellId));
+      fields.set(CellMonitorARFCN, Value::integer(cell.channel));
+      fields.set(CellMonitorRSSI, measuredValue(cell.level / 2));
+      break;
+    case Access::UMTS:
+    case Access::UTRAN2:
+      fields.set(CellMonitorLAC, Value::integer(cell.areaCode));
+      fields.set(CellMonitorCellId, Value::integer(cell.cellId));
+      fields.set(CellMonitorUARFCN, Value::integer(cell.channel));
+      fields.set(CellMonitorBandInfo, Value::integer(cell.band));
+      fields.set(CellMonitorSCN, Value::integer(cell.code));
+      fields.set(CellMonitorRSCP, measuredValue(cell.level));
+      fields.set(CellMonitorECN0, measuredValue(cell.quality));
+      break;
+    case Access::LTE:
+      fields.set(CellMonitorTAC, Value::integer(cell.areaCode));
+      fields.set(CellMonitorCellId, Value::integer(cell.cellId));
+      fields.set(CellMonitorPID, Value::integer(cell.code));
+      fields.set(CellMonitorUARFCN, Value::integer(cell.channel));
+      fields.set(CellMonitorBandInfo, Value::integer(cell.band));
+      fields.set(CellMonitorRSSI, measuredValue(cell.level / 2));
+      break;
+  }
+  return fields;
+}
+
+Value SimulatedNetwork::cellList() const {
+  std::vector<const Cell*> neighbours;
+  for (const Cell& cell : cells_) {
+    if (!cell.serving) neighbours.push_back(&cell);
+  }
+  // Strongest first, as the cell monitor sorts them; unmeasured cells last.
+  std::stable_sort(neighbours.begin(), neighbours.end(), [](const Cell* a, const Cell* b) {
+    if (a->measured != b->measured) return a->measured;
+    return a->level > b->level;
+  });
+  Array list;
+  list.append(Value(cellFields(cells_[serving_])));
+  for (const Cell* cell : neighbours) list.append(Value(cellFields(*cell)));
+  return Value(list);
+}
+
+Value SimulatedNetwork::simFiles() const {
+  // The identities and location files are hex dumps of the elementary files'
+  // contents; numbers are shown as dialled.
+  const Cell& serving = cells_[serving_];
+  const std::string home = plmnIdentity(kMobileCountryCode, kMobileNetworkCode);
+  const std::string locationArea = home + hex(static_cast<std::uint64_t>(serving.areaCode), 2);
+  const int accessClass = imsi_.back() - '0';
+  const std::string unusedPlmn = "FFFFFF";
+
+  Dictionary files;
+  files.set("kSimFile_ICCID", Value(iccid_));
+  files.set("kSimFile_MSISDN", Value(msisdn_));
+  files.set("kSimFile_MBDN", Value(mailbox_));
+  files.set("kSimFile_HPPLMN", Value("05"));  // search every 5 x 6 minutes
+  // TMSI, LAI, TMSI time (none), update status (updated).
+  files.set("kSimFile_LOCI", Value(hex(tmsi_, 4) + locationArea + "FF" + "00"));
+  // P-TMSI, its signature, RAI, routing area update status (updated).
+  files.set("kSimFile_PSLOCI", Value(hex(ptmsi_, 4) + hex(ptmsiSignature_, 3) + locationArea +
+                                     hex(static_cast<std::uint64_t>(routingAreaCode_), 1) + "00"));
+  files.set("kSimFile_ACC", Value(hex(1u << accessClass, 2)));  // the class is the IMSI's last digit
+  files.set("kSimFile_AD", Value("00000002"));                 // normal operation, 2-digit MNC
+  files.set("kSimFile_FPLMN", Value(plmnIdentity(kMobileCountryCode, 2) + unusedPlmn + unusedPlmn + unusedPlmn));
+  files.set("kSimFile_AHPLMN", Value(home));
+  files.set("kSimFile_RATMODE", Value("00"));  // no restriction of access technologies
+  files.set("kSimFile_PNN", Value(networkNameElement(0x43, "Test Network") + networkNameElement(0x45, "Test")));
+  // The whole home network (LAC 0000-FFFE) is named by PNN record 1.
+  files.set("kSimFile_OPL", Value(home + "0000" + "FFFE" + "01"));
+  // Home network on UTRAN, E-UTRAN and GSM; two unused entries.
+  files.set("kSimFile_OPLMNAcT", Value(home + "C080" + unusedPlmn + "0000" + unusedPlmn + "0000"));
+  return Value(files);
+}
+
+Value SimulatedNetwork::pdpContexts() const {
+  Array contexts;
+  Dictionary internet;
+  internet.set("Context ID", Value("1"));
+  internet.set("APN", Value("internet"));
+  internet.set("PDP Type", Value("IPv4"));
+  internet.set("PDP Address", Value(internetAddress_));
+  internet.set("QoS", Value("Interactive, priority 3, 384/2048 kbit/s up/down"));
+  contexts.append(Value(internet));
+  if (imsActive_) {
+    Dictionary ims;
+    ims.set("Context ID", Value("2"));
+    ims.set("APN", Value("ims"));
+    ims.set("PDP Type", Value("IPv6"));
+    ims.set("PDP Address", Value(imsAddress_));
+    ims.set("QoS", Value("Conversational, 64/64 kbit/s up/down"));
+    contexts.append(Value(ims));
+  }
+  return Value(contexts);
+}
+
+}  // namespace corvane::telephonyd

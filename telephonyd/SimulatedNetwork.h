@@ -1,0 +1,110 @@
+#pragma once
+
+// What the service itself knows about the phone in a log-code scenario, and
+// reports as extra codes: the SIM's elementary files (0xFF0000), the cell
+// monitor's list of the serving cell and its neighbours (0xFF0001) and the
+// active PDP contexts (0xFF0002).
+//
+// The phone is registered on the test network 001-01. The cells are those of
+// the scenario's technology:
+//   Quendra_GSM     camped on UMTS (band 1), with UMTS and GSM 900 neighbours;
+//                   falls back to the strongest GSM cell when the UMTS level
+//                   collapses, and returns when UMTS is strong again
+//   Quendra_UTRAN2  camped on a UTRAN2 cell (band 34 or 39), with UTRAN2 and
+//                   GSM 900 neighbours
+//   Quendra_LTE     camped on LTE (band 3), with intra- and inter-frequency LTE
+//                   neighbours (band 3, 7, 20)
+// Every measurement period the levels take a random-walk step, quality follows
+// level, now and then a neighbour goes unmeasured, and a neighbour of the
+// serving cell's access technology that stays clearly stronger takes over. The
+// SIM's location files follow the registered area; a second PDP context (IMS)
+// comes and goes now and then.
+//
+// Everything depends only on the technology, the seed and the number of steps.
+
+#include <chrono>
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "platform/Value.h"
+#include "telephonyd/SeededRandom.h"
+
+namespace corvane::telephonyd {
+
+class SimulatedNetwork {
+ public:
+  static constexpr std::chrono::seconds kMeasurementPeriod{1};
+
+  enum class Access { GSM, UMTS, UTRAN2, LTE };
+
+  struct Cell {
+    Access access = Access::GSM;
+    bool serving = false;
+    int areaCode = 0;   // LAC; the TAC on LTE
+    int cellId = 0;
+    int channel = 0;    // ARFCN (GSM), UARFCN (UMTS, UTRAN2) or E-ARFCN (LTE)
+    int band = 0;       // UMTS, UTRAN2 and LTE
+    int code = 0;       // scrambling code (UMTS), cell parameter id (UTRAN2), physical cell id (LTE)
+    int level = 0;      // dBm: RSSI (GSM, LTE) or RSCP (UMTS, UTRAN2); GSM and LTE levels are even
+    int quality = 0;    // Ec/N0 in dB (UMTS, UTRAN2)
+    bool measured = true;
+    int strongerSteps = 0;  // consecutive steps clearly above the serving cell
+  };
+
+  // Throws std::invalid_argument for a technology that is not a log-code technology.
+  SimulatedNetwork(std::string_view technology, std::uint64_t seed);
+
+  // One measurement period later.
+  void step();
+
+  // Dictionary of the 14 SIM files, each a string.
+  Value simFiles() const;
+  // Array of cell dictionaries, serving cell first, then neighbours strongest first.
+  Value cellList() const;
+  // Array of context dictionaries, every value a string.
+  Value pdpContexts() const;
+
+  const std::vector<Cell>& cells() const { return cells_; }
+  const Cell& servingCell() const { return cells_[serving_]; }
+  std::uint64_t steps() const { return steps_; }
+  std::uint64_t cellChanges() const { return cellChanges_; }
+  // Counts the changes of the PDP contexts, so that a reporter sees when to report them again.
+  std::uint64_t pdpGeneration() const { return pdpGeneration_; }
+  const std::string& imsi() const { return imsi_; }
+
+  static constexpr int kMobileCountryCode = 1;  // 001
+  static constexpr int kMobileNetworkCode = 1;  // 01
+
+ private:
+  void addCells(Access access, int count, int areaCode);
+  void drift(Cell& cell);
+  void changeServingCell(std::size_t to);
+  std::size_t strongest(Access access) const;
+  Dictionary cellFields(const Cell& cell) const;
+
+  SeededRandom random_;
+  std::vector<Cell> cells_;
+  std::size_t serving_ = 0;
+  std::uint64_t steps_ = 0;
+  std::uint64_t cellChanges_ = 0;
+
+  // SIM
+  std::string imsi_;
+  std::string iccid_;
+  std::string msisdn_;
+  std::string mailbox_;
+  std::uint32_t tmsi_ = 0;
+  std::uint32_t ptmsi_ = 0;
+  std::uint32_t ptmsiSignature_ = 0;
+  int routingAreaCode_ = 0;
+
+  // PDP
+  std::uint64_t pdpGeneration_ = 0;
+  std::string internetAddress_;
+  bool imsActive_ = false;
+  std::string imsAddress_;
+};
+
+}  // namespace corvane::telephonyd
