@@ -30,14 +30,14 @@ CorvanePaneController::CorvanePaneController(NodeRef node, std::string path, Scr
 }
 
 void CorvanePaneController::createToolbarItems() {
-  auto* indicator = new ActivityIndicator;
+  auto* indicator = new ActivityIndicator(toolbar());
   if (_isLoading) {
     indicator->startAnimating();
   } else {
     indicator->stopAnimating();
   }
 
-  auto* status = new QLabel(_status);
+  auto* status = new QLabel(_status, toolbar());
   status->setObjectName(QStringLiteral("StatusLabel"));
   status->setTextFormat(Qt::PlainText);
   status->setFont(theme::systemFont(kStatusFontSize));
@@ -50,7 +50,7 @@ void CorvanePaneController::createToolbarItems() {
 
   std::vector<BarItem> items{BarItem::item(indicator), BarItem::item(status), BarItem::flexibleSpace()};
   if (_application.allowSaveButton()) {
-    auto* save = new QToolButton;
+    auto* save = new QToolButton(toolbar());
     save->setObjectName(QStringLiteral("SaveButton"));
     save->setText(tr("Save"));
     save->setIcon(style()->standardIcon(QStyle::SP_DialogSaveButton));

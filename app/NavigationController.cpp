@@ -66,6 +66,10 @@ void ViewController::setToolbarItems(std::vector<BarItem> items, bool /*animated
       _toolbarLayout->addStretch(1);
     } else if (item.widget) {
       _toolbarLayout->addWidget(item.widget, 0, Qt::AlignVCenter);
+      // Shown now rather than when the layout gets to it, unless hidden on purpose.
+      const bool hiddenOnPurpose =
+          item.widget->isHidden() && item.widget->testAttribute(Qt::WA_WState_ExplicitShowHide);
+      if (!hiddenOnPurpose) item.widget->show();
     }
   }
 }

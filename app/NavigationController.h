@@ -48,7 +48,7 @@ class ViewController : public QWidget {
   // Replaces the toolbar's items; the widgets of the previous items are deleted.
   void setToolbarItems(std::vector<BarItem> items, bool animated);
   // The toolbar that shows the items (the navigation controller shows it while
-  // this screen is on top).
+  // this screen is on top). Item widgets are best made as its children.
   QWidget* toolbar() const { return _toolbar; }
 
   // The stack this screen is on (or is presented over); nullptr for none.
