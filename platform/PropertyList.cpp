@@ -224,6 +224,24 @@ bool looksLikePropertyList(std::span<const std::uint8_t> data) {
   return s.starts_with("<?xml") || s.starts_with("<plist") || s.starts_with("<!DOCTYPE plist");
 }
 
+// The library's binary reader makes a dictionary key that holds a NUL into a
+// node that its own key accessor then fails an assertion on (the stored length
+// counts past the NUL). Written out and read back once, every such key is cut
+// at the NUL, as the XML reader cuts it, and reads safely. (The binary reader
+// already cuts string values at a NUL.)
+plist_t normalizedBinaryTree(plist_t root) {
+  if (!root) return nullptr;
+  NodePtr original(root);
+  char* bin = nullptr;
+  std::uint32_t binLength = 0;
+  plist_to_bin(root, &bin, &binLength);
+  std::unique_ptr<char, MallocDeleter> binGuard(bin);
+  if (!bin || binLength == 0) return nullptr;
+  plist_t normalized = nullptr;
+  plist_from_bin(bin, binLength, &normalized);
+  return normalized;
+}
+
 std::optional<Value> parse(std::span<const std::uint8_t> data, std::string* error) {
   if (data.empty()) {
     setError(error, "empty data is not a property list");
@@ -243,6 +261,7 @@ std::optional<Value> parse(std::span<const std::uint8_t> data, std::string* erro
   const auto length = static_cast<std::uint32_t>(data.size());
   if (binary) {
     plist_from_bin(chars, length, &root);
+    root = normalizedBinaryTree(root);
   } else {
     plist_from_xml(chars, length, &root);
   }

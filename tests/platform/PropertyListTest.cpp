@@ -106,6 +106,20 @@ TEST(PropertyList, ARawNulInsideXmlTextIsReadWithoutACrash) {
   EXPECT_EQ(v.asString()->front(), 'a');
 }
 
+TEST(PropertyList, ABinaryKeyHoldingANulIsCutAtTheNul) {
+  // {"a\0b": "x"} as another writer makes it; the library's own key accessor
+  // cannot read such a key whole.
+  const Bytes binary = {0x62, 0x70, 0x6c, 0x69, 0x73, 0x74, 0x30, 0x30, 0xd1, 0x01, 0x02, 0x53, 0x61,
+                        0x00, 0x62, 0x51, 0x78, 0x08, 0x0b, 0x0f, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00,
+                        0x01, 0x01, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x03, 0x00, 0x00, 0x00,
+                        0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x11};
+  const Value v = plist::parseOrThrow(binary);
+  ASSERT_TRUE(v.isDictionary());
+  ASSERT_EQ(v.asDictionary()->size(), 1u);
+  EXPECT_EQ(v.asDictionary()->entries()[0].first, "a");
+  EXPECT_EQ(*v.asDictionary()->entries()[0].second.asString(), "x");
+}
+
 TEST(PropertyList, NestingBeyondTheLimitIsRefusedOnReadAndWrite) {
   std::string xml = "<?xml version=\"1.0\"?><plist>";
   for (int i = 0; i < plist::kMaximumNesting + 2; ++i) xml += "<array>";
