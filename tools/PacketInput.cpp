@@ -67,21 +67,29 @@ std::optional<Bytes> parseHexLine(std::string_view line, std::string& reason) {
   return out;
 }
 
-std::optional<std::vector<Bytes>> packetsFromContents(std::span<const std::uint8_t> contents, const std::string& source,
-                                                      InputError& error) {
+InputFormat detectInputFormat(std::span<const std::uint8_t> contents) {
+  if (plist::looksLikePropertyList(contents)) {
+    const auto root = plist::parse(contents);
+    return root && isSnapshot(*root) ? InputFormat::Snapshot : InputFormat::PropertyList;
+  }
+  return isText(contents) ? InputFormat::HexText : InputFormat::Dlf;
+}
+
+std::optional<PacketList> packetsFromContents(std::span<const std::uint8_t> contents, const std::string& source,
+                                              InputError& error) {
   if (plist::looksLikePropertyList(contents)) {
     std::string reason;
-    if (!plist::parse(contents, &reason)) {
+    const auto root = plist::parse(contents, &reason);
+    if (!root) {
       error.message = source + ": " + reason;
       return std::nullopt;
     }
-    return std::vector<Bytes>{Bytes(contents.begin(), contents.end())};
+    if (isSnapshot(*root)) return packetsFromSnapshot(*root, source, error);
+    return PacketList{{Bytes(contents.begin(), contents.end())}, {}};
   }
-  if (!isText(contents)) {
-    error.message = source + ": neither a property list nor text with one hex packet per line";
-    return std::nullopt;
-  }
-  std::vector<Bytes> packets;
+  if (!isText(contents)) return packetsFromDlf(contents, source, error);
+
+  PacketList list;
   const std::string_view text(reinterpret_cast<const char*>(contents.data()), contents.size());
   std::size_t lineNumber = 0;
   std::size_t start = 0;
@@ -98,9 +106,9 @@ std::optional<std::vector<Bytes>> packetsFromContents(std::span<const std::uint8
       error.message = source + ":" + std::to_string(lineNumber) + ": bad hex line: " + reason;
       return std::nullopt;
     }
-    packets.push_back(std::move(*packet));
+    list.packets.push_back(std::move(*packet));
   }
-  return packets;
+  return list;
 }
 
 std::optional<Bytes> readInput(const std::string& path, InputError& error) {

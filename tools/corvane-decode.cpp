@@ -33,10 +33,24 @@ void printHelp() {
       "\n"
       "Decodes baseband log packets offline and prints the display tree.\n"
       "\n"
-      "Each FILE (standard input when none is given, or for \"-\") is either a\n"
-      "property list (one packet), or text with one packet per line in hex, exactly\n"
-      "as the telephony service delivers it. Blanks and colons may stand between\n"
-      "bytes; blank lines and lines starting with # are skipped.\n"
+      "Each FILE (standard input when none is given, or for \"-\") is read in the\n"
+      "format its contents show:\n"
+      "  property list  one packet (XML or binary)\n"
+      "  snapshot       a property list with \"Timestamp\" and \"Data\", as the\n"
+      "                 application saves it: the packets of its history are\n"
+      "                 replayed in order; its DLF only when the history holds none\n"
+      "  DLF            any other binary: log records (16-bit length of the whole\n"
+      "                 record, 16-bit code, 8-byte timestamp, payload), each\n"
+      "                 replayed as a packet of type 0x01, or 0xFF when its payload\n"
+      "                 is a binary property list; version reports (code 0x1FFD)\n"
+      "                 are skipped. Where a 0x01 or 0xFF byte may be a packet's\n"
+      "                 type byte kept in the file, the reading that gives the most\n"
+      "                 whole records wins (on a tie: no type byte)\n"
+      "  hex text       one packet per line in hex, exactly as the telephony\n"
+      "                 service delivers it; blanks and colons may stand between\n"
+      "                 bytes, blank lines and lines starting with # are skipped\n"
+      "A file cut off in its last record or packet is read up to there, with a\n"
+      "warning that names the offset.\n"
       "\n"
       "Options:\n"
       "  -t, --technology NAME  the log-channel technology: IFX, Quendra_GSM,\n"
@@ -117,7 +131,10 @@ int main(int argc, char** argv) {
       std::fprintf(stderr, "corvane-decode: %s\n", error.message.c_str());
       return kExitInput;
     }
-    for (auto& p : *filePackets) packets.push_back(std::move(p));
+    for (const auto& warning : filePackets->warnings) {
+      std::fprintf(stderr, "corvane-decode: warning: %s\n", warning.c_str());
+    }
+    for (auto& p : filePackets->packets) packets.push_back(std::move(p));
   }
 
   if (logToStderr) {

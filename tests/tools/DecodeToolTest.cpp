@@ -4,6 +4,7 @@
 
 #include <nlohmann/json.hpp>
 
+#include "support/LogRecords.h"
 #include "support/Process.h"
 #include "support/Values.h"
 
@@ -130,6 +131,66 @@ TEST(DecodeTool, AMalformedPropertyListFileExitsWithOne) {
   const auto r = runProcess({kDecode, "-t", "IFX", dir.write("bad.plist", "<?xml version=\"1.0\"?><plist><dict>")});
   EXPECT_EQ(r.exitCode, 1);
   EXPECT_NE(r.err.find("bad.plist: malformed XML property list"), std::string::npos) << r.err;
+}
+
+// A SIM-file extra code, as the service sends it.
+Bytes simFilesPacket(const std::string& iccid) {
+  return test::withType(0xFF, test::logRecord(0x0000, 7, test::binaryBytes(D({{"kSimFile_ICCID", S(iccid)}}))));
+}
+
+TEST(DecodeTool, ADlfFileIsReplayedThroughTheLogCodeGenerator) {
+  const Bytes dlf =
+      test::dlfOfIntervals({{simFilesPacket("89001010000000000018")}, {simFilesPacket("89001012345678901234")}});
+  test::TemporaryDirectory dir;
+  const auto r = runProcess({kDecode, "-t", "Quendra_LTE", dir.write("capture", asText(dlf))});
+  ASSERT_EQ(r.exitCode, 0) << r.err;
+  EXPECT_EQ(r.err, "");
+  EXPECT_NE(r.out.find("\n  SIM Info\n    EF-ICCID: 89001012345678901234\n"), std::string::npos) << r.out;
+}
+
+TEST(DecodeTool, ASnapshotFileReplaysItsHistory) {
+  const Value snapshot = D({{"Timestamp", S("2026-11-16 08:00:00 +0000")},
+                            {"Data", A({D({{"DisplayState", Value(simFilesPacket("89001012345678901234"))}}),
+                                        D({{"Description", S("DLF binary (161 bytes)")},
+                                           {"DLF", Value(test::dlfVersionReport())}})})},
+                            {"Description", S("drive test")}});
+  test::TemporaryDirectory dir;
+  const auto r = runProcess({kDecode, "-t", "Quendra_GSM", dir.write("CorvaneSnapshot-1.corvane",
+                                                                     asText(test::xmlBytes(snapshot)))});
+  ASSERT_EQ(r.exitCode, 0) << r.err;
+  EXPECT_NE(r.out.find("\n    EF-ICCID: 89001012345678901234\n"), std::string::npos) << r.out;
+}
+
+TEST(DecodeTool, AnIfxSnapshotShowsItsLastReport) {
+  const Value snapshot = D({{"Timestamp", S("2026-11-16 08:00:00 +0000")},
+                            {"Data", A({D({{"DisplayState", D({{"Serving", S("62")}})}}),
+                                        D({{"DisplayState", D({{"Serving", S("70")}})}})})}});
+  const auto r = runProcess({kDecode, "-t", "IFX"}, asText(test::xmlBytes(snapshot)));
+  ASSERT_EQ(r.exitCode, 0) << r.err;
+  EXPECT_EQ(r.out, "Corvane\n  Serving: 70\n");
+}
+
+TEST(DecodeTool, ATruncatedDlfIsReadUpToItsLastWholeRecordWithAWarning) {
+  Bytes dlf = test::dlfOfIntervals({{simFilesPacket("89001012345678901234")}});
+  const std::size_t cutAt = dlf.size();
+  const Bytes next = simFilesPacket("89001010000000000018");
+  dlf.insert(dlf.end(), next.begin(), next.begin() + 20);
+  test::TemporaryDirectory dir;
+  const std::string file = dir.write("cut.dlf", asText(dlf));
+  const auto r = runProcess({kDecode, "-t", "Quendra_LTE", file});
+  ASSERT_EQ(r.exitCode, 0) << r.err;
+  EXPECT_EQ(r.err, "corvane-decode: warning: " + file + ": truncated record at offset " + std::to_string(cutAt) +
+                       "; its 20 bytes are left out\n");
+  EXPECT_NE(r.out.find("EF-ICCID: 89001012345678901234\n"), std::string::npos) << r.out;
+}
+
+TEST(DecodeTool, BinaryThatIsNoDlfExitsWithOne) {
+  test::TemporaryDirectory dir;
+  const std::string file = dir.write("random.bin", std::string("\x00\x00\x17\xFF\x80", 5));
+  const auto r = runProcess({kDecode, "-t", "Quendra_LTE", file});
+  EXPECT_EQ(r.exitCode, 1);
+  EXPECT_EQ(r.out, "");
+  EXPECT_EQ(r.err, "corvane-decode: " + file + ": not a DLF file: no whole log record at offset 0\n");
 }
 
 TEST(DecodeTool, BadUsageExitsWithTwo) {

@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include "support/LogRecords.h"
 #include "support/Values.h"
 
 namespace corvane::tools {
@@ -29,7 +30,8 @@ TEST(PacketFile, HexTextGivesOnePacketPerLineSkippingCommentsAndBlankLines) {
   InputError error;
   auto packets = packetsFromContents(bytesOf("# capture\n01 02\r\n\n  # indented comment\nff:00\n"), "f", error);
   ASSERT_TRUE(packets) << error.message;
-  EXPECT_EQ(*packets, (std::vector<Bytes>{{0x01, 0x02}, {0xFF, 0x00}}));
+  EXPECT_EQ(packets->packets, (std::vector<Bytes>{{0x01, 0x02}, {0xFF, 0x00}}));
+  EXPECT_TRUE(packets->warnings.empty());
 }
 
 TEST(PacketFile, ABadHexLineNamesItsLineNumber) {
@@ -43,9 +45,9 @@ TEST(PacketFile, APropertyListIsOnePacket) {
   InputError error;
   auto packets = packetsFromContents(xml, "p.plist", error);
   ASSERT_TRUE(packets);
-  EXPECT_EQ(*packets, std::vector<Bytes>{xml});
+  EXPECT_EQ(packets->packets, std::vector<Bytes>{xml});
   const Bytes binary = test::binaryBytes(test::D({{"Serving", test::S("62")}}));
-  EXPECT_EQ(*packetsFromContents(binary, "p.bplist", error), std::vector<Bytes>{binary});
+  EXPECT_EQ(packetsFromContents(binary, "p.bplist", error)->packets, std::vector<Bytes>{binary});
 }
 
 TEST(PacketFile, AMalformedPropertyListIsAnError) {
@@ -54,10 +56,41 @@ TEST(PacketFile, AMalformedPropertyListIsAnError) {
   EXPECT_EQ(error.message, "bad.plist: malformed XML property list");
 }
 
-TEST(PacketFile, BinaryThatIsNeitherFormIsAnError) {
+TEST(PacketFile, BinaryThatIsNoPropertyListIsReadAsDlf) {
+  const Bytes record = test::logRecord(0x4005, 1, {1, 2});
   InputError error;
+  auto packets = packetsFromContents(record, "capture.bin", error);
+  ASSERT_TRUE(packets) << error.message;
+  EXPECT_EQ(packets->packets, std::vector<Bytes>{test::withType(0x01, record)});
   EXPECT_FALSE(packetsFromContents(Bytes{0x81, 0x01, 0x00, 0x10}, "raw.bin", error));
-  EXPECT_EQ(error.message, "raw.bin: neither a property list nor text with one hex packet per line");
+  EXPECT_EQ(error.message, "raw.bin: not a DLF file: no whole log record at offset 0");
+}
+
+TEST(PacketFile, ASnapshotReplaysItsHistory) {
+  const Bytes packet = test::withType(0x01, test::logRecord(0x4005, 1, {1, 2}));
+  const Bytes snapshot = test::xmlBytes(test::D({{"Timestamp", test::S("2026-11-16 08:00:00 +0000")},
+                                                 {"Data", test::A({test::D({{"DisplayState", Value(packet)}})})}}));
+  InputError error;
+  auto packets = packetsFromContents(snapshot, "s.corvane", error);
+  ASSERT_TRUE(packets) << error.message;
+  EXPECT_EQ(packets->packets, std::vector<Bytes>{packet});
+}
+
+TEST(InputFormat, IsToldByTheContents) {
+  const Value report = test::D({{"Serving", test::S("62")}});
+  EXPECT_EQ(detectInputFormat(test::xmlBytes(report)), InputFormat::PropertyList);
+  EXPECT_EQ(detectInputFormat(test::binaryBytes(report)), InputFormat::PropertyList);
+  // Either key alone does not make a snapshot.
+  EXPECT_EQ(detectInputFormat(test::xmlBytes(test::D({{"Data", test::A({})}}))), InputFormat::PropertyList);
+  const Value snapshot = test::D({{"Timestamp", test::S("t")}, {"Data", test::A({})}});
+  EXPECT_EQ(detectInputFormat(test::xmlBytes(snapshot)), InputFormat::Snapshot);
+  EXPECT_EQ(detectInputFormat(test::binaryBytes(snapshot)), InputFormat::Snapshot);
+  EXPECT_EQ(detectInputFormat(test::logRecord(0x4005, 0, {})), InputFormat::Dlf);
+  EXPECT_EQ(detectInputFormat(test::dlfVersionReport()), InputFormat::Dlf);
+  EXPECT_EQ(detectInputFormat(bytesOf("01 0c 00 05 40 00 00 00 00 00 00 00 00\n")), InputFormat::HexText);
+  EXPECT_EQ(detectInputFormat(Bytes{}), InputFormat::HexText);
+  // A malformed property list is still one: reading it says what is wrong.
+  EXPECT_EQ(detectInputFormat(bytesOf("<?xml version=\"1.0\"?><plist><dict>")), InputFormat::PropertyList);
 }
 
 TEST(PacketFile, AMissingFileIsAnErrorNamingIt) {
