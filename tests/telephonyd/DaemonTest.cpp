@@ -15,10 +15,13 @@
 #include <thread>
 
 #include "LogGenerator/GSM/GSMLogGenerator.h"
+#include "LogGenerator/LogGenerator.h"
+#include "PacketInput.h"
 #include "platform/PropertyList.h"
 #include "platform/SocketMessagePort.h"
 #include "platform/SocketTelephonyClient.h"
 #include "platform/VirtualRunLoop.h"
+#include "support/LogRecords.h"
 #include "support/Process.h"
 #include "transport/RuntimeTestDirectory.h"
 
@@ -108,6 +111,7 @@ class Client {
     local_ = ports.createLocalPort(localName_, [this](LocalMessagePort&, MessageId id, const Bytes& data) {
       ids.push_back(id);
       last = data;
+      if (keepAll) all.push_back(data);
       return std::optional<Bytes>();
     });
     if (!local_) return;
@@ -139,9 +143,14 @@ class Client {
   }
 
   std::int32_t start() { return remote_->sendRequest(0, command({{"SetState", "Streaming"}}), 1.0, 0.0, nullptr); }
+  std::int32_t start(const Dictionary& fields) {
+    return remote_->sendRequest(0, plist::serializeOrThrow(Value(fields), plist::Format::XML), 1.0, 0.0, nullptr);
+  }
 
   std::vector<MessageId> ids;
   Bytes last;
+  bool keepAll = false;
+  std::vector<Bytes> all;
 
  private:
   SocketPortSystem& ports_;
@@ -151,6 +160,21 @@ class Client {
   std::shared_ptr<LocalMessagePort> local_;
   std::shared_ptr<RemoteMessagePort> remote_;
 };
+
+// The first value under the key, searched depth first.
+const Value* findKey(const Value& tree, std::string_view key) {
+  if (const Dictionary* d = tree.asDictionary()) {
+    if (const Value* v = d->find(key)) return v;
+    for (const auto& [name, child] : d->entries()) {
+      if (const Value* v = findKey(child, key)) return v;
+    }
+  } else if (const Array* a = tree.asArray()) {
+    for (const Value& child : a->elements()) {
+      if (const Value* v = findKey(child, key)) return v;
+    }
+  }
+  return nullptr;
+}
 
 class DaemonTest : public ::testing::Test {
  protected:
@@ -206,6 +230,132 @@ TEST_F(DaemonTest, StartCommandStreamsDecodablePacketsWithMessageIdZero) {
   const Value display = generator.generateLogUsingState(state);
   ASSERT_TRUE(display.asDictionary());
   EXPECT_TRUE(display.asDictionary()->contains("Serving Cell"));
+}
+
+Dictionary logCodeStart(std::initializer_list<std::int64_t> logCodes, std::initializer_list<std::int64_t> extraCodes) {
+  auto numbers = [](std::initializer_list<std::int64_t> list) {
+    Array array;
+    for (auto n : list) array.append(Value::integer(n));
+    return Value(array);
+  };
+  Dictionary fields;
+  fields.set("SetState", Value("Streaming"));
+  fields.set("SetQuendraLogCodes", numbers(logCodes));
+  fields.set("SetTsExtraCodes", numbers(extraCodes));
+  return fields;
+}
+
+std::uint32_t effectiveCode(const Bytes& packet) {
+  const std::uint32_t code = packet.at(3) | packet.at(4) << 8;
+  return packet.at(0) == 0xFF ? 0xFF0000 | code : code;
+}
+
+TEST_F(DaemonTest, LogCodeTechnologyStreamsOnlyTheCellListsThatTheStartCommandAsksFor) {
+  Daemon daemon(ports, {"--technology", "Quendra_LTE", "--rate", "max", "--packets", "30"});
+  Client client(ports, loop);
+  ASSERT_TRUE(client.connected());
+  client.keepAll = true;
+  ASSERT_EQ(client.technology(), "Quendra_LTE");
+  ASSERT_EQ(client.start(logCodeStart({}, {1})), kPortSuccess);
+  ASSERT_TRUE(pumpUntil([&] { return client.all.size() >= 30; }));
+  pumpFor(50ms);
+  ASSERT_EQ(client.all.size(), 30u);
+  for (const Bytes& packet : client.all) {
+    ASSERT_GE(packet.size(), 13u);
+    EXPECT_EQ(effectiveCode(packet), 0xFF0001u);
+    EXPECT_EQ(packet[1] | packet[2] << 8, static_cast<int>(packet.size() - 1));
+    const auto cells = plist::parse(std::span(packet).subspan(13));
+    ASSERT_TRUE(cells && cells->asArray() && !cells->asArray()->empty());
+    const Value& serving = cells->asArray()->at(0);
+    EXPECT_EQ(serving.asDictionary()->get("CellMonitorCellRadioAccessTechnology"),
+              Value("CellMonitorRadioAccessTechnologyLTE"));
+    EXPECT_EQ(serving.asDictionary()->get("CellMonitorCellType"), Value("CellMonitorCellTypeServing"));
+  }
+}
+
+TEST_F(DaemonTest, StartCommandWithAnotherTechnologysCodesGetsNothingOfThem) {
+  Daemon daemon(ports, {"--technology", "Quendra_UTRAN2", "--rate", "max"});
+  Client client(ports, loop);
+  ASSERT_TRUE(client.connected());
+  ASSERT_EQ(client.technology(), "Quendra_UTRAN2");
+  // The LTE generator's log codes, without extra codes.
+  ASSERT_EQ(client.start(logCodeStart({0xB0C2, 0xB0C1, 0xB179, 0xB17F, 0xB180, 0xB186}, {})), kPortSuccess);
+  pumpFor(300ms);
+  EXPECT_TRUE(client.ids.empty());
+  EXPECT_TRUE(daemon.running());
+}
+
+TEST_F(DaemonTest, LogCodePacketsTravelToTheDecodeToolsReadersAndDecoderUnchanged) {
+  Daemon daemon(ports, {"--technology", "Quendra_GSM", "--rate", "max", "--packets", "40", "--seed", "3",
+                        "--clock-start", "1800000000"});
+  Client client(ports, loop);
+  ASSERT_TRUE(client.connected());
+  client.keepAll = true;
+  ASSERT_EQ(client.start(logCodeStart({0x5134, 0x4005}, {0, 1, 2})), kPortSuccess);
+  ASSERT_TRUE(pumpUntil([&] { return client.all.size() >= 40; }));
+  const std::vector<Bytes>& packets = client.all;
+  ASSERT_EQ(packets.size(), 40u);
+  // The first period: SIM files, cell list, PDP contexts, at the start of the clock.
+  EXPECT_EQ(effectiveCode(packets[0]), 0xFF0000u);
+  EXPECT_EQ(effectiveCode(packets[1]), 0xFF0001u);
+  EXPECT_EQ(effectiveCode(packets[2]), 0xFF0002u);
+  EXPECT_EQ(Bytes(packets[0].begin() + 5, packets[0].begin() + 13),
+            (Bytes{0x00, 0x80, 0x98, 0x28, 0x17, 0x65, 0x06, 0x00}));  // 1 800 000 000 000 000 us
+
+  tools::InputError error;
+  // As hex text, one packet per line.
+  std::string hex;
+  for (const Bytes& packet : packets) {
+    for (std::uint8_t b : packet) {
+      hex += "0123456789abcdef"[b >> 4];
+      hex += "0123456789abcdef"[b & 15];
+    }
+    hex += '\n';
+  }
+  auto fromHex = tools::packetsFromContents(Bytes(hex.begin(), hex.end()), "capture.hex", error);
+  ASSERT_TRUE(fromHex) << error.message;
+  EXPECT_EQ(fromHex->packets, packets);
+
+  // As a DLF that the application wrote over three display intervals.
+  const std::vector<std::vector<Bytes>> intervals = {{packets.begin(), packets.begin() + 7},
+                                                     {packets.begin() + 7, packets.begin() + 25},
+                                                     {packets.begin() + 25, packets.end()}};
+  const Bytes dlf = test::dlfOfIntervals(intervals);
+  ASSERT_EQ(tools::detectInputFormat(dlf), tools::InputFormat::Dlf);
+  auto fromDlf = tools::packetsFromContents(dlf, "capture.dlf", error);
+  ASSERT_TRUE(fromDlf) << error.message;
+  EXPECT_EQ(fromDlf->packets, packets);
+  EXPECT_TRUE(fromDlf->warnings.empty());
+
+  // As a snapshot of those intervals.
+  Array data;
+  for (const auto& interval : intervals) {
+    Dictionary entry;
+    entry.set("DisplayState", Value(test::concatenated(interval)));
+    data.append(Value(entry));
+  }
+  Dictionary dlfEntry;
+  dlfEntry.set("DLF", Value(dlf));
+  data.append(Value(dlfEntry));
+  Dictionary snapshot;
+  snapshot.set("Timestamp", Value("2027-01-15 08:00:00 +0000"));
+  snapshot.set("Data", Value(data));
+  auto fromSnapshot = tools::packetsFromContents(plist::serializeOrThrow(Value(snapshot), plist::Format::XML),
+                                                 "CorvaneSnapshot-1800000000.corvane", error);
+  ASSERT_TRUE(fromSnapshot) << error.message;
+  EXPECT_EQ(fromSnapshot->packets, packets);
+
+  // And the GSM/UMTS generator shows the SIM files they carry.
+  auto generator = LogGenerator::generatorFromTechnology("Quendra_GSM");
+  ASSERT_TRUE(generator);
+  Dictionary state;
+  for (const Bytes& packet : fromDlf->packets) generator->updateState(state, packet);
+  const Value display = generator->generateLogUsingState(state);
+  const Value* simInfo = findKey(display, "SIM Info");
+  ASSERT_TRUE(simInfo && simInfo->asDictionary());
+  const Value* iccid = simInfo->asDictionary()->find("EF-ICCID");
+  ASSERT_TRUE(iccid && iccid->asString());
+  EXPECT_EQ(iccid->asString()->substr(0, 7), "8900101");
 }
 
 TEST_F(DaemonTest, PacketLimitIsHonouredExactly) {
