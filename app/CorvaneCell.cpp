@@ -54,8 +54,10 @@ CorvaneCell* CorvaneCell::initWithStyle(Style style, const QString& reuseIdentif
   cell->_view->setFocusPolicy(Qt::NoFocus);
   cell->_view->viewport()->setAutoFillBackground(false);
   cell->_scrolledContent = new QWidget;
-  cell->_scrolledContent->setAutoFillBackground(false);
   cell->_view->setWidget(cell->_scrolledContent);
+  // After setWidget, which turns the filling on: the row's own background (and
+  // its selection) shows through.
+  cell->_scrolledContent->setAutoFillBackground(false);
   // Touch screens drag a long value sideways; mice use the horizontal wheel.
   QScroller::grabGesture(cell->_view->viewport(), QScroller::TouchGesture);
   cell->_key = makeLabel(cell->_scrolledContent, theme::boldSystemFont(kFontSize), theme::kDarkText);

@@ -84,6 +84,12 @@ void CorvaneSaveViewController::viewDidLoad() {
   _ui->saveContentTable->sizeToFit();
 }
 
+void CorvaneSaveViewController::viewWillAppear(bool animated) {
+  ViewController::viewWillAppear(animated);
+  // Now inside the window, the list has the window's style and its final frame.
+  _ui->saveContentTable->sizeToFit();
+}
+
 const Array* CorvaneSaveViewController::entries() const { return _saveHistory.asArray(); }
 
 std::string CorvaneSaveViewController::snapshotFileAt(const Date& date) const {

@@ -38,6 +38,7 @@ class CorvaneSaveViewController final : public ViewController, private TableView
   ~CorvaneSaveViewController() override;
 
   void viewDidLoad();
+  void viewWillAppear(bool animated) override;
   void savePressed();
   void cancelPressed();
   bool textFieldShouldReturn(QLineEdit* textField);

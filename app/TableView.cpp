@@ -195,6 +195,7 @@ void TableView::deselectRowAtIndexPath(const IndexPath& indexPath, bool animated
 }
 
 void TableView::sizeToFit() {
+  ensurePolished();  // the frame's width comes from the style
   setFixedHeight(numberOfRows() * TableViewCell::kHeight + 2 * frameWidth());
 }
 

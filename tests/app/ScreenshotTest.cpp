@@ -1,0 +1,124 @@
+// The real application against the real corvane-telephonyd process, on the Qt
+// run loop over real sockets: the tree arrives, a section opens, the save
+// screen saves. Each step is also kept as a picture in the build directory
+// (and in docs/screenshots when CORVANE_UPDATE_SCREENSHOTS=1).
+
+#include <QDir>
+#include <QImage>
+
+#include <algorithm>
+#include <csignal>
+#include <cstdlib>
+#include <fstream>
+#include <iterator>
+
+#include "AppTestSupport.h"
+#include "model/SocketModelEnvironment.h"
+#include "platform/PropertyList.h"
+
+namespace corvane {
+
+namespace {
+
+const std::string kService = CORVANE_TELEPHONYD_BINARY;
+constexpr int kWindowWidth = 400;
+constexpr int kWindowHeight = 720;
+
+}  // namespace
+
+class ScreenshotTest : public QObject {
+  Q_OBJECT
+
+ private:
+  // Grabs the window and keeps the picture; true when every copy was written.
+  bool keep(QWidget* window, const QString& name) {
+    QCoreApplication::processEvents();
+    const QImage image = window->grab().toImage();
+    if (image.isNull() || image.size() != QSize(kWindowWidth, kWindowHeight)) return false;
+    QStringList directories{QStringLiteral(CORVANE_SCREENSHOT_BUILD_DIR)};
+    if (qEnvironmentVariable("CORVANE_UPDATE_SCREENSHOTS") == QLatin1String("1")) {
+      directories << QStringLiteral(CORVANE_SOURCE_DIR "/docs/screenshots");
+    }
+    bool written = true;
+    for (const QString& directory : directories) {
+      QDir().mkpath(directory);
+      written &= image.save(directory + QLatin1Char('/') + name + QStringLiteral(".png"));
+    }
+    return written;
+  }
+
+ private slots:
+  void theApplicationShowsTheServicesTreeOpensASectionAndSavesASnapshot() {
+    test::TemporaryDirectory directory;
+    const std::string runtime = directory.path() + "/run";
+    const std::filesystem::path root = directory.path() + "/device";
+    std::filesystem::create_directories(devicePath(kSaveEnablingMarkerPath, root));
+    std::filesystem::create_directories(devicePath(kSnapshotDirectoryPath, root));
+    ::setenv("CORVANE_RUNTIME_DIR", runtime.c_str(), 1);
+
+    std::string error;
+    std::unique_ptr<SocketModelEnvironment> platform = SocketModelEnvironment::create(error);
+    QVERIFY2(platform, error.c_str());
+    const int service = test::startProcess({kService, "--technology", "IFX", "--seed", "7", "--rate", "50"},
+                                           {"CORVANE_RUNTIME_DIR=" + runtime}, directory.path() + "/service.log");
+    QTRY_VERIFY_WITH_TIMEOUT(std::filesystem::exists(runtime + "/corvane-telephonyd.sock"), 10000);
+
+    Preferences preferences(QString::fromStdString(directory.path() + "/config"));
+    {
+      CorvaneApp app(CorvaneAppEnvironment{platform->environment(), preferences, root});
+      app.applicationDidFinishLaunching();
+      QWidget* window = app.window();
+      window->resize(kWindowWidth, kWindowHeight);
+      QVERIFY(QTest::qWaitForWindowExposed(window));
+      NavigationController* navigation = app.navigationController();
+      auto top = [&] { return qobject_cast<CorvanePaneController*>(navigation->topViewController()); };
+
+      // The first display update: the sections of the IFX scenario.
+      QTRY_VERIFY_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 3, 20000);
+      QVERIFY(app.model()->isConnected());
+      QVERIFY(test::statusTextOf(top()).startsWith(QStringLiteral("Updated ")));
+      QVERIFY(test::indicatorOf(top())->isHidden());
+      QCOMPARE(test::cellAt(top(), 0)->key()->text(), QStringLiteral("Network"));
+      QVERIFY(keep(window, QStringLiteral("root")));
+
+      test::tapRow(top(), test::rowWithKey(top(), QStringLiteral("Serving Cell")));
+      QCOMPARE(top()->path(), std::string("/Serving Cell"));
+      QVERIFY(test::rowWithKey(top(), QStringLiteral("ARFCN")) >= 0);
+      const int rxlev = test::rowWithKey(top(), QStringLiteral("RxLev"));
+      QVERIFY(rxlev >= 0);
+      QVERIFY(test::cellAt(top(), rxlev)->value()->text().endsWith(QStringLiteral(" dBm")));
+      // It stays current: the next update reloads it in place.
+      const QString firstStatus = test::statusTextOf(top());
+      QTRY_VERIFY_WITH_TIMEOUT(test::statusTextOf(top()) != firstStatus, 10000);
+      QCOMPARE(top()->path(), std::string("/Serving Cell"));
+      QVERIFY(keep(window, QStringLiteral("serving-cell")));
+
+      app.showSaveView();
+      CorvaneSaveViewController* save = app.saveViewController();
+      QVERIFY(save);
+      QVERIFY(save->saveContentTable()->numberOfRows() >= 1);
+      save->saveDescription()->setText(QStringLiteral("Drive test, north ring road"));
+      QVERIFY(keep(window, QStringLiteral("save")));
+
+      save->saveButton()->click();
+      QTRY_VERIFY(!app.saveViewController());
+      const auto files = std::filesystem::directory_iterator(devicePath(kSnapshotDirectoryPath, root));
+      const auto file = std::find_if(std::filesystem::begin(files), std::filesystem::end(files), [](const auto& entry) {
+        return entry.path().filename().string().rfind("CorvaneSnapshot-", 0) == 0;
+      });
+      QVERIFY(file != std::filesystem::end(files));
+      std::ifstream in(file->path(), std::ios::binary);
+      const Bytes bytes((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
+      const Value snapshot = plist::parseOrThrow(bytes);
+      QVERIFY(snapshot.asDictionary() && snapshot.asDictionary()->get("Data").isArray());
+      QCOMPARE(*snapshot.asDictionary()->find("Description")->asString(), std::string("Drive test, north ring road"));
+    }
+    test::stopProcess(service, SIGTERM);
+    ::unsetenv("CORVANE_RUNTIME_DIR");
+  }
+};
+
+}  // namespace corvane
+
+QTEST_MAIN(corvane::ScreenshotTest)
+#include "ScreenshotTest.moc"
