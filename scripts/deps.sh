@@ -8,6 +8,7 @@ packages=(
   clang libclang-rt-14-dev
   qt6-base-dev libplist-dev nlohmann-json3-dev
   libgtest-dev libgmock-dev libbenchmark-dev
+  libqt6svg6 fonts-dejavu-core libplist-utils xvfb xauth dbus-daemon
 )
 
 missing=()

@@ -1,19 +1,32 @@
 #!/usr/bin/env bash
-# Corvane's main job, until the screens exist: starts the telephony service with
-# its built-in simulator and runs the headless monitor for three display
-# updates, then stops both. Extra arguments go to corvane-monitor
-# (e.g. --format json, --updates 10).
+# Corvane's main job: builds the application and the telephony service and runs
+# the demo: the service with its built-in simulator, and the application
+# connected to it, until the application quits (or Ctrl-C). Extra arguments go
+# to corvane-demo (e.g. --seed 7). Without a display, run it under
+# xvfb-run -a, or use --headless.
+#
+#   bash scripts/run.sh --headless [ARGS]   the service and corvane-monitor for
+#                                           three display updates, as text
+#                                           (ARGS go to corvane-monitor)
 set -euo pipefail
 cd "$(dirname "$0")/.."
 bash scripts/deps.sh
 cmake -S . -B build/release -G Ninja -DCMAKE_BUILD_TYPE=Release -DCORVANE_TESTS=OFF -DCORVANE_BENCH=OFF >/dev/null
-cmake --build build/release -j "$(nproc)" --target corvane-telephonyd corvane-monitor corvane-decode >/dev/null
 
-# A private runtime directory, so that this run never meets another service.
-export CORVANE_RUNTIME_DIR
-CORVANE_RUNTIME_DIR=$(mktemp -d /tmp/corvane-run-XXXXXX)
-build/release/telephonyd/corvane-telephonyd --technology IFX &
-service=$!
-trap 'kill "$service" 2>/dev/null; wait "$service" 2>/dev/null; rm -rf "$CORVANE_RUNTIME_DIR"' EXIT
-[ $# -gt 0 ] || set -- --updates 3
-build/release/tools/corvane-monitor "$@"
+if [ "${1:-}" = "--headless" ]; then
+  shift
+  cmake --build build/release -j "$(nproc)" --target corvane-telephonyd corvane-monitor corvane-decode >/dev/null
+  # A private runtime directory, so that this run never meets another service.
+  export CORVANE_RUNTIME_DIR
+  CORVANE_RUNTIME_DIR=$(mktemp -d /tmp/corvane-run-XXXXXX)
+  build/release/telephonyd/corvane-telephonyd --technology IFX &
+  service=$!
+  trap 'kill "$service" 2>/dev/null; wait "$service" 2>/dev/null; rm -rf "$CORVANE_RUNTIME_DIR"' EXIT
+  [ $# -gt 0 ] || set -- --updates 3
+  build/release/tools/corvane-monitor "$@"
+  exit
+fi
+
+cmake --build build/release -j "$(nproc)" --target corvane corvane-demo corvane-telephonyd corvane-monitor \
+  corvane-decode >/dev/null
+exec build/release/app/corvane-demo "$@"
