@@ -224,22 +224,54 @@ bool looksLikePropertyList(std::span<const std::uint8_t> data) {
   return s.starts_with("<?xml") || s.starts_with("<plist") || s.starts_with("<!DOCTYPE plist");
 }
 
-// The library's binary reader makes a dictionary key that holds a NUL into a
-// node that its own key accessor then fails an assertion on (the stored length
-// counts past the NUL). Written out and read back once, every such key is cut
-// at the NUL, as the XML reader cuts it, and reads safely. (The binary reader
-// already cuts string values at a NUL.)
-plist_t normalizedBinaryTree(plist_t root) {
-  if (!root) return nullptr;
-  NodePtr original(root);
-  char* bin = nullptr;
-  std::uint32_t binLength = 0;
-  plist_to_bin(root, &bin, &binLength);
-  std::unique_ptr<char, MallocDeleter> binGuard(bin);
-  if (!bin || binLength == 0) return nullptr;
-  plist_t normalized = nullptr;
-  plist_from_bin(bin, binLength, &normalized);
-  return normalized;
+// The library's binary reader accepts a string object that holds a NUL
+// character, but a dictionary key made from one fails an assertion inside the
+// library's own key accessor (the stored length counts past the NUL), which
+// would end the program. So before a binary property list goes to the library,
+// its string objects are looked at: one that holds a NUL refuses the whole
+// list. (String values are cut at a NUL by the binary reader anyway.) Only the
+// object table is walked, bounds-checked; anything malformed is left for the
+// library to refuse.
+bool binaryStringHoldsNul(std::span<const std::uint8_t> data) {
+  constexpr std::size_t kHeaderSize = 8;
+  constexpr std::size_t kTrailerSize = 32;
+  if (data.size() < kHeaderSize + kTrailerSize) return false;
+  auto bigEndian = [&](std::size_t at, std::size_t width, std::uint64_t& out) {
+    if (width == 0 || width > 8 || at > data.size() || width > data.size() - at) return false;
+    out = 0;
+    for (std::size_t i = 0; i < width; ++i) out = (out << 8) | data[at + i];
+    return true;
+  };
+  const std::size_t trailer = data.size() - kTrailerSize;
+  const std::size_t offsetSize = data[trailer + 6];
+  std::uint64_t objectCount = 0, tableOffset = 0;
+  bigEndian(trailer + 8, 8, objectCount);
+  bigEndian(trailer + 24, 8, tableOffset);
+  if (offsetSize == 0 || offsetSize > 8 || tableOffset >= trailer || objectCount > (trailer - tableOffset) / offsetSize) {
+    return false;
+  }
+  for (std::uint64_t i = 0; i < objectCount; ++i) {
+    std::uint64_t at = 0;
+    if (!bigEndian(static_cast<std::size_t>(tableOffset + i * offsetSize), offsetSize, at) || at >= trailer) continue;
+    const std::uint8_t marker = data[at];
+    const unsigned kind = marker >> 4;
+    if (kind != 0x5 && kind != 0x6) continue;  // ASCII or UTF-16 string
+    std::uint64_t length = marker & 0x0F;
+    std::size_t body = static_cast<std::size_t>(at) + 1;
+    if (length == 0x0F) {  // the length follows as an integer object
+      if (body >= trailer || (data[body] >> 4) != 0x1) continue;
+      const std::size_t width = std::size_t{1} << (data[body] & 0x0F);
+      if (!bigEndian(body + 1, width, length)) continue;
+      body += 1 + width;
+    }
+    const std::uint64_t unit = kind == 0x6 ? 2 : 1;
+    if (body > trailer || length > (trailer - body) / unit) continue;
+    for (std::uint64_t c = 0; c < length; ++c) {
+      const std::size_t pos = body + static_cast<std::size_t>(c * unit);
+      if (data[pos] == 0 && (unit == 1 || data[pos + 1] == 0)) return true;
+    }
+  }
+  return false;
 }
 
 std::optional<Value> parse(std::span<const std::uint8_t> data, std::string* error) {
@@ -260,8 +292,11 @@ std::optional<Value> parse(std::span<const std::uint8_t> data, std::string* erro
   const auto* chars = reinterpret_cast<const char*>(data.data());
   const auto length = static_cast<std::uint32_t>(data.size());
   if (binary) {
+    if (binaryStringHoldsNul(data)) {
+      setError(error, "binary property list with a NUL character inside a string");
+      return std::nullopt;
+    }
     plist_from_bin(chars, length, &root);
-    root = normalizedBinaryTree(root);
   } else {
     plist_from_xml(chars, length, &root);
   }

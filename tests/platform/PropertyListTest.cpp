@@ -106,18 +106,30 @@ TEST(PropertyList, ARawNulInsideXmlTextIsReadWithoutACrash) {
   EXPECT_EQ(v.asString()->front(), 'a');
 }
 
-TEST(PropertyList, ABinaryKeyHoldingANulIsCutAtTheNul) {
+TEST(PropertyList, ABinaryListWithANulInsideAStringIsRefused) {
   // {"a\0b": "x"} as another writer makes it; the library's own key accessor
-  // cannot read such a key whole.
+  // would fail an assertion on such a key.
   const Bytes binary = {0x62, 0x70, 0x6c, 0x69, 0x73, 0x74, 0x30, 0x30, 0xd1, 0x01, 0x02, 0x53, 0x61,
                         0x00, 0x62, 0x51, 0x78, 0x08, 0x0b, 0x0f, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00,
                         0x01, 0x01, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x03, 0x00, 0x00, 0x00,
                         0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x11};
-  const Value v = plist::parseOrThrow(binary);
-  ASSERT_TRUE(v.isDictionary());
-  ASSERT_EQ(v.asDictionary()->size(), 1u);
-  EXPECT_EQ(v.asDictionary()->entries()[0].first, "a");
-  EXPECT_EQ(*v.asDictionary()->entries()[0].second.asString(), "x");
+  std::string error;
+  EXPECT_FALSE(plist::parse(binary, &error).has_value());
+  EXPECT_EQ(error, "binary property list with a NUL character inside a string");
+  // The same list without the NUL reads.
+  Bytes fixed = binary;
+  fixed[13] = 'c';
+  const Value v = plist::parseOrThrow(fixed);
+  EXPECT_EQ(v.asDictionary()->entries()[0].first, "acb");
+}
+
+TEST(PropertyList, AUtf16KeyHoldingANulIsRefusedToo) {
+  // {"\u00e9\u0000": "x"}: a UTF-16 key whose second unit is NUL.
+  const Bytes binary = {0x62, 0x70, 0x6c, 0x69, 0x73, 0x74, 0x30, 0x30, 0xd1, 0x01, 0x02, 0x62, 0x00, 0xe9, 0x00,
+                        0x00, 0x51, 0x78, 0x08, 0x0b, 0x10, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x01, 0x01, 0x00,
+                        0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x03, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00,
+                        0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x12};
+  EXPECT_FALSE(plist::parse(binary).has_value());
 }
 
 TEST(PropertyList, NestingBeyondTheLimitIsRefusedOnReadAndWrite) {
