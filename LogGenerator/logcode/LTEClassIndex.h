@@ -9,6 +9,15 @@
 
 namespace corvane {
 
+class LTEServingCellInfo;
+class ConnectedModeMeasurementMisc;
+class MeasuredNeighborCells;
+class DetectedCells;
+class ServingCellMeasurement;
+class NeighborMeasurementMisc;
+class NeighborCellsList;
+class ReselectionCandidatesMisc;
+class ReselectionCandidatesList;
 class SimInfo;
 class PDPContextList;
 
@@ -19,6 +28,15 @@ class LTEClassIndex final : public ClassIndex {
   ~LTEClassIndex() override;
 
  private:
+  std::shared_ptr<LTEServingCellInfo> objLTEServingCellInfo;
+  std::shared_ptr<ConnectedModeMeasurementMisc> objConnectedModeMeasurementMisc;
+  std::shared_ptr<MeasuredNeighborCells> objMeasuredNeighborCells;
+  std::shared_ptr<DetectedCells> objDetectedCells;
+  std::shared_ptr<ServingCellMeasurement> objServingCellMeasurement;
+  std::shared_ptr<NeighborMeasurementMisc> objNeighborMeasurementMisc;
+  std::shared_ptr<NeighborCellsList> objNeighborCellsList;
+  std::shared_ptr<ReselectionCandidatesMisc> objReselectionCandidatesMisc;
+  std::shared_ptr<ReselectionCandidatesList> objReselectionCandidatesList;
   std::shared_ptr<SimInfo> objSimInfo;
   std::shared_ptr<PDPContextList> objPDPContextList;
 };

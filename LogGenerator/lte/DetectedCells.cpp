@@ -1,0 +1,45 @@
+#include "LogGenerator/lte/DetectedCells.h"
+
+#include "LogGenerator/lte/LteConversions.h"
+#include "LogGenerator/lte/LteLists.h"
+#include "LogGenerator/lte/MeasuredNeighborCells.h"
+#include "platform/Log.h"
+
+namespace corvane {
+
+namespace {
+constexpr std::size_t kMinimumLength = 29;
+constexpr std::size_t kCountOffset = 28;
+constexpr std::size_t kCellSize = 2;
+}  // namespace
+
+BoundedList DetectedCells::cells(const PacketView& packet) {
+  const BoundedList measured = MeasuredNeighborCells::cells(packet);
+  const std::size_t behindMeasured =
+      MeasuredNeighborCells::kFirstCell + MeasuredNeighborCells::kCellSize * measured.count();
+  return BoundedList(packet.u8(kCountOffset), behindMeasured, kCellSize);
+}
+
+void DetectedCells::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
+  log::write(log::kWarning, "Detected Cells");
+  if (logCode != lte::kConnectedIntraFrequencyCode) {
+    logUnknownCode(logCode);
+    return;
+  }
+  const PacketView packet(data);
+  if (packet.size() < kMinimumLength) return;
+  const lte::SectionList list(*this);
+  const BoundedList detected = cells(packet);
+  if (detected.count() == 0) return;
+  Array rows;
+  for (std::uint8_t i = 0; i < detected.count(); ++i) {
+    const std::size_t cell = detected.entryOffset(i);
+    if (!lte::entryInside(packet, cell, kCellSize)) break;
+    Dictionary row;
+    row.set("Physical Cell ID", lte::decimalText(packet.le16(cell)));
+    rows.append(Value(std::move(row)));
+  }
+  list.install(rows);
+}
+
+}  // namespace corvane

@@ -1,0 +1,22 @@
+#pragma once
+
+// "Detected Cells": cells the baseband detected but has not yet measured, one
+// row per physical cell ID, listed right behind the measured neighbours of
+// the same record.
+
+#include "LogGenerator/logcode/Base.h"
+
+namespace corvane {
+
+class DetectedCells final : public Base {
+ public:
+  void updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) override;
+  std::string getSectionName() const override { return "Detected Cells"; }
+  std::vector<std::uint32_t> getLogCodeArray() const override { return {0xB179}; }
+
+  // The detected cells of a record: the count at byte 28, then 2 bytes a cell
+  // behind the measured neighbours.
+  static BoundedList cells(const PacketView& packet);
+};
+
+}  // namespace corvane

@@ -1,0 +1,75 @@
+#include "LogGenerator/lte/NeighborCellsList.h"
+
+#include "LogGenerator/lte/LteConversions.h"
+#include "LogGenerator/lte/LteLists.h"
+#include "platform/Log.h"
+
+namespace corvane {
+
+namespace {
+
+constexpr std::size_t kMinimumLength = 21;
+
+// Every decibel value of a cell is traced under this one label.
+void traceDecibels(double value) { log::printf(log::kWarning, "Measured RSSI: %lf\n", value); }
+
+}  // namespace
+
+BoundedList NeighborCellsList::cells(const PacketView& packet) {
+  return BoundedList(packet.bits16(19, 6, 10) + 1, kFirstCell, kCellSize);
+}
+
+void NeighborCellsList::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
+  log::write(log::kWarning, "Neighbor Cells List");
+  if (logCode != lte::kNeighborMeasurementCode) {
+    logUnknownCode(logCode);
+    return;
+  }
+  const PacketView packet(data);
+  if (packet.size() < kMinimumLength) return;
+  const lte::SectionList list(*this);
+  const BoundedList neighbors = cells(packet);
+  log::printf(log::kWarning, "Number of neighboring cells being reported: %d\n", static_cast<int>(neighbors.count()));
+  Array rows;
+  for (std::uint8_t i = 0; i < neighbors.count(); ++i) {
+    const std::size_t cell = neighbors.entryOffset(i);
+    if (!lte::entryInside(packet, cell, kCellSize)) break;
+    const std::uint32_t physicalCellId = packet.bits16(cell, 0, 8);
+    const std::uint32_t measuredRssi = packet.bits32(cell, 9, 16);
+    const std::uint32_t measuredRsrp = packet.bits32(cell, 17, 25);
+    const std::uint32_t averageRsrp = packet.bits16(cell + 4, 0, 8);
+    const std::uint32_t measuredRsrq = packet.bits16(cell + 4, 9, 15);
+    const std::uint32_t averageRsrq = packet.bits8(cell + 6, 0, 6);
+    const std::uint32_t srxlev = packet.bits32(cell + 4, 23, 29);
+    // Both antennas' rows read antenna 0's bits; the display has always shown them so.
+    const std::uint32_t frameOffset = packet.bits16(cell + 12, 0, 10);
+    const std::uint32_t sampleOffset = packet.bits32(cell + 12, 11, 29);
+
+    log::printf(log::kWarning, "Physical Cell ID: %d\n", static_cast<int>(physicalCellId));
+    traceDecibels(lte::rssiDbm(measuredRssi));
+    traceDecibels(lte::neighborRsrpDbm(measuredRsrp));
+    traceDecibels(lte::neighborRsrpDbm(averageRsrp));
+    traceDecibels(lte::servingRsrqDb(measuredRsrq));
+    traceDecibels(lte::servingRsrqDb(averageRsrq));
+    traceDecibels(lte::offset30Dbm(srxlev));
+
+    Dictionary row;
+    row.reserve(12);
+    row.set("Physical Cell ID", lte::decimalText(physicalCellId));
+    row.set("Measured RSSI", lte::rssiText(measuredRssi));
+    row.set("Measured RSRP", lte::neighborRsrpText(measuredRsrp));
+    row.set("Average RSRP", lte::neighborRsrpText(averageRsrp));
+    row.set("Measured RSRQ", lte::servingRsrqText(measuredRsrq));
+    row.set("Average RSRQ", lte::servingRsrqText(averageRsrq));
+    row.set("Srxlev", lte::offset30DbmText(srxlev));
+    row.set("Frequency Offset", lte::decimalText(packet.le16(cell + 8)));
+    row.set("Ant 0 Frame Offset", lte::decimalText(frameOffset));
+    row.set("Ant 0 Sample Offset", lte::decimalText(sampleOffset));
+    row.set("Ant 1 Frame Offset", lte::decimalText(frameOffset));
+    row.set("Ant 1 Sample Offset", lte::decimalText(sampleOffset));
+    rows.append(Value(std::move(row)));
+  }
+  list.install(rows);
+}
+
+}  // namespace corvane

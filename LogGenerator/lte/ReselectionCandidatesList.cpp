@@ -1,0 +1,127 @@
+#include "LogGenerator/lte/ReselectionCandidatesList.h"
+
+#include <array>
+
+#include "LogGenerator/lte/LteConversions.h"
+#include "LogGenerator/lte/LteLists.h"
+#include "platform/Log.h"
+
+namespace corvane {
+
+namespace {
+
+using Candidate = ReselectionCandidatesList::Candidate;
+
+constexpr std::size_t kMinimumLength = 21;
+
+void setLteRows(const Candidate& candidate, const Dictionary& row) {
+  const auto fields = candidate.lte();
+  row.set("E ARFCN", lte::decimalText(fields.earfcn));
+  row.set("Cell ID", lte::decimalText(fields.cellId));
+}
+
+void setUtranRows(const Candidate& candidate, const Dictionary& row) {
+  const auto fields = candidate.utran();
+  row.set("U ARFCN", lte::decimalText(fields.uarfcn));
+  row.set("PSC", lte::decimalText(fields.psc));
+}
+
+void setGeranRows(const Candidate& candidate, const Dictionary& row) {
+  const auto fields = candidate.geran();
+  row.set("ARFCN", lte::decimalText(fields.arfcn));
+  row.set("Band", lte::decimalText(fields.band));
+  row.set("BSIC ID", lte::decimalText(fields.bsicId));
+}
+
+void setCdmaRows(const Candidate& candidate, const Dictionary& row) {
+  const auto fields = candidate.cdma();
+  row.set("Band", lte::decimalText(fields.band));
+  row.set("Channel", lte::decimalText(fields.channel));
+  row.set("Pilot", lte::decimalText(fields.pilot));
+}
+
+struct CandidateTechnology {
+  std::uint32_t value;
+  std::string_view ratType;
+  // How far from the candidate's start its fields reach.
+  std::size_t extent;
+  void (*setRows)(const Candidate&, const Dictionary&);
+};
+
+constexpr std::array<CandidateTechnology, 5> kTechnologies = {{
+    {Candidate::kLte, "LTE", 8, setLteRows},
+    {Candidate::kUtran, "UTRAN", 8, setUtranRows},
+    {Candidate::kGeran, "GERAN", 8, setGeranRows},
+    {Candidate::kCdma1xRtt, "CDMA1XRTT", 12, setCdmaRows},
+    {Candidate::kCdmaHrpd, "CDMAHRPD", 12, setCdmaRows},
+}};
+// A technology the list does not know shows this and no further rows.
+constexpr CandidateTechnology kUnknownTechnology = {0, "??", Candidate::kHeaderSize, nullptr};
+
+const CandidateTechnology& technologyOf(const Candidate& candidate) {
+  for (const auto& technology : kTechnologies) {
+    if (technology.value == candidate.technology()) return technology;
+  }
+  return kUnknownTechnology;
+}
+
+}  // namespace
+
+// --- Candidate ---
+
+std::size_t Candidate::extent() const { return technologyOf(*this).extent; }
+
+void Candidate::require(bool ownTechnology) const {
+  if (!ownTechnology) throw ArrayOutOfBoundsException();
+}
+
+ReselectionCandidatesList::LteFields Candidate::lte() const {
+  require(technology() == kLte);
+  return {packet_.le16(offset_ + 4), packet_.bits16(offset_ + 6, 7, 15)};
+}
+
+ReselectionCandidatesList::UtranFields Candidate::utran() const {
+  require(technology() == kUtran);
+  return {packet_.le16(offset_ + 4), packet_.le16(offset_ + 6)};
+}
+
+ReselectionCandidatesList::GeranFields Candidate::geran() const {
+  require(technology() == kGeran);
+  return {packet_.le16(offset_ + 4), packet_.u8(offset_ + 6), packet_.u8(offset_ + 7)};
+}
+
+ReselectionCandidatesList::CdmaFields Candidate::cdma() const {
+  require(technology() == kCdma1xRtt || technology() == kCdmaHrpd);
+  return {packet_.u8(offset_ + 4), packet_.le16(offset_ + 8), packet_.le16(offset_ + 10)};
+}
+
+// --- The section ---
+
+void ReselectionCandidatesList::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
+  log::write(log::kWarning, "Reselection Candidates List");
+  if (logCode != lte::kReselectionCandidatesCode) {
+    logUnknownCode(logCode);
+    return;
+  }
+  const PacketView packet(data);
+  if (packet.size() < kMinimumLength) return;
+  const lte::SectionList list(*this);
+  const Candidates candidates(packet);
+  if (candidates.listedCount() == 0) return;
+  Array rows;
+  for (std::uint8_t i = 0; i < candidates.listedCount(); ++i) {
+    const Candidate candidate = candidates.candidate(i);
+    if (!lte::entryInside(packet, candidate.offset(), Candidate::kHeaderSize)) break;
+    const CandidateTechnology& technology = technologyOf(candidate);
+    if (!lte::entryInside(packet, candidate.offset(), technology.extent)) break;
+    Dictionary row;
+    row.reserve(5);
+    row.set("Candidate Priority", lte::decimalText(candidate.priority()));
+    row.set("Candidate RAT Type", technology.ratType);
+    if (technology.setRows) technology.setRows(candidate, row);
+    rows.append(Value(std::move(row)));
+  }
+  list.install(rows);
+}
+
+}  // namespace corvane

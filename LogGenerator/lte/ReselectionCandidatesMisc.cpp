@@ -1,0 +1,26 @@
+#include "LogGenerator/lte/ReselectionCandidatesMisc.h"
+
+#include "LogGenerator/lte/LteConversions.h"
+#include "platform/Log.h"
+
+namespace corvane {
+
+namespace {
+constexpr std::size_t kMinimumLength = 21;
+}  // namespace
+
+void ReselectionCandidatesMisc::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
+  log::write(log::kWarning, "Reselection Candidates");
+  if (logCode != lte::kReselectionCandidatesCode) {
+    logUnknownCode(logCode);
+    return;
+  }
+  const PacketView packet(data);
+  if (packet.size() < kMinimumLength) return;
+  const lte::SectionRows rows(*this);
+  rows.set("Version", lte::decimalText(packet.u8(13)));
+  rows.set("Serving EARFCN", lte::decimalText(packet.le16(15)));
+  rows.set("Serving Cell ID", lte::decimalText(packet.le16(17)));
+}
+
+}  // namespace corvane
