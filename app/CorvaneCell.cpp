@@ -1,7 +1,6 @@
 #include "app/CorvaneCell.h"
 
 #include <QFontMetrics>
-#include <QScroller>
 
 #include "app/Theme.h"
 
@@ -58,8 +57,6 @@ CorvaneCell* CorvaneCell::initWithStyle(Style style, const QString& reuseIdentif
   // After setWidget, which turns the filling on: the row's own background (and
   // its selection) shows through.
   cell->_scrolledContent->setAutoFillBackground(false);
-  // Touch screens drag a long value sideways; mice use the horizontal wheel.
-  QScroller::grabGesture(cell->_view->viewport(), QScroller::TouchGesture);
   cell->_key = makeLabel(cell->_scrolledContent, theme::boldSystemFont(kFontSize), theme::kDarkText);
   cell->_value = makeLabel(cell->_scrolledContent, theme::systemFont(kFontSize), theme::kValueText);
   return cell;

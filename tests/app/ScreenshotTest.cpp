@@ -80,6 +80,10 @@ class ScreenshotTest : public QObject {
       QVERIFY(test::indicatorOf(top())->isHidden());
       QCOMPARE(test::cellAt(top(), 0)->key()->text(), QStringLiteral("Network"));
       QVERIFY(keep(window, QStringLiteral("root")));
+      // The window carries the application's icon (drawn from its SVG).
+      const QPixmap icon = window->windowIcon().pixmap(128, 128);
+      QVERIFY(!icon.isNull());
+      QVERIFY(icon.save(QStringLiteral(CORVANE_SCREENSHOT_BUILD_DIR "/icon.png")));
 
       test::tapRow(top(), test::rowWithKey(top(), QStringLiteral("Serving Cell")));
       QCOMPARE(top()->path(), std::string("/Serving Cell"));
