@@ -1,6 +1,8 @@
 #include "telephonyd/SimulatedNetwork.h"
 
 #include <algorithm>
+#include <array>
+#include <cmath>
 #include <stdexcept>
 
 #include "platform/CellMonitor.h"
@@ -17,6 +19,39 @@ constexpr int kImsToggleOneIn = 60;    // chance per step that the IMS context c
 // Below this UMTS level the GSM/UMTS phone falls back to GSM; above the other it returns.
 constexpr int kUmtsFallbackLevel = -105;
 constexpr int kUmtsReturnLevel = -95;
+
+// The LTE bands of the scenario. On each, the uplink E-ARFCN lies 18000 above the downlink one.
+struct LteBand {
+  int band;
+  int uplinkOffset;
+  int resourceBlocks;
+};
+constexpr std::array<LteBand, 3> kLteBands = {{
+    {3, 18000, 100},
+    {7, 18000, 100},
+    {20, 18000, 50},
+}};
+
+const LteBand& lteBand(int band) {
+  for (const LteBand& entry : kLteBands) {
+    if (entry.band == band) return entry;
+  }
+  throw std::logic_error("no LTE carrier plan for band " + std::to_string(band));
+}
+
+constexpr double kLowestRsrp = -125;
+constexpr double kHighestRsrp = -70;
+constexpr double kLowestRsrq = -20;
+constexpr double kHighestRsrq = -3;
+
+// RSSI sums the power of all resource elements of the carrier (12 per
+// resource block), about half of them loaded; RSRP is the power of one
+// reference-signal element, so it lies below RSSI by about this much:
+// 28 dB on 100 resource blocks, 25 dB on 50.
+double rsrpBelowRssi(int resourceBlocks) { return std::round(10 * std::log10(12.0 * resourceBlocks) - 3); }
+
+// A layer-3 filter of equal weights, kept on the half-dB steps.
+double filtered(double average, double latest) { return std::round(average + latest) / 2; }
 
 struct LevelRange {
   int low;
@@ -107,7 +142,7 @@ std::string number(long long value) { return std::to_string(value); }
 
 }  // namespace
 
-SimulatedNetwork::SimulatedNetwork(std::string_view technology, std::uint64_t seed) : random_(seed) {
+SimulatedNetwork::SimulatedNetwork(std::string_view technology, std::uint64_t seed) : random_(seed), radio_(~seed) {
   const int areaCode = random_.uniform(0x1000, 0x7FFF);
   if (technology == kLogChannelTechnologyQuendraGSM) {
     addCells(Access::UMTS, 5, areaCode);
@@ -117,6 +152,17 @@ SimulatedNetwork::SimulatedNetwork(std::string_view technology, std::uint64_t se
     addCells(Access::GSM, 3, areaCode);
   } else if (technology == kLogChannelTechnologyQuendraLTE) {
     addCells(Access::LTE, 6, areaCode);
+    for (Cell& cell : cells_) {
+      const LteBand& band = lteBand(cell.band);
+      cell.uplinkChannel = cell.channel + band.uplinkOffset;
+      cell.resourceBlocks = band.resourceBlocks;
+      measureLteCell(cell);
+      cell.averageRsrp = cell.rsrp;
+      cell.averageRsrq = cell.rsrq;
+    }
+    // A UMTS band 1 cell and a GSM 1800 cell.
+    interRatNeighbours_.push_back({Access::UMTS, radio_.uniform(10562, 10838), radio_.uniform(0, 511), 1});
+    interRatNeighbours_.push_back({Access::GSM, radio_.uniform(512, 885), radio_.uniform(0, 63), 0});
   } else {
     throw std::invalid_argument("no simulated network for technology " + std::string(technology));
   }
@@ -238,7 +284,21 @@ void SimulatedNetwork::drift(Cell& cell) {
     // Ec/N0 follows the level, with some noise.
     cell.quality = std::clamp((cell.level + 60) / 4 - 2 + random_.uniform(-1, 1), -24, 0);
   }
+  if (cell.access == Access::LTE) {
+    measureLteCell(cell);
+    cell.averageRsrp = filtered(cell.averageRsrp, cell.rsrp);
+    cell.averageRsrq = filtered(cell.averageRsrq, cell.rsrq);
+  }
   cell.measured = cell.serving || !random_.oneIn(kUnmeasuredOneIn);
+}
+
+void SimulatedNetwork::measureLteCell(Cell& cell) {
+  // Levels are even, so both land on half-dB steps.
+  const double rsrp = cell.level - rsrpBelowRssi(cell.resourceBlocks) + 0.5 * radio_.uniform(-2, 2);
+  // From -3 dB at -40 dBm down to -18 dB at -100 dBm, as Ec/N0 follows RSCP.
+  const double rsrq = -3 + 0.25 * (cell.level + 40) + 0.5 * radio_.uniform(-1, 1);
+  cell.rsrp = std::clamp(rsrp, kLowestRsrp, kHighestRsrp);
+  cell.rsrq = std::clamp(rsrq, kLowestRsrq, kHighestRsrq);
 }
 
 std::size_t SimulatedNetwork::strongest(Access access) const {

@@ -20,6 +20,14 @@
 // SIM's location files follow the registered area; a second PDP context (IMS)
 // comes and goes now and then.
 //
+// LTE cells also carry what the LTE radio records report: the carrier (uplink
+// E-ARFCN, bandwidth) and the reference-signal measurements. RSRP follows the
+// cell's RSSI, lower by the spread of the carrier's power over its resource
+// elements; RSRQ follows the level as Ec/N0 does on UMTS; both with some noise
+// of their own, and with a filtered (averaged) value beside the latest one. The
+// LTE network also names a UTRAN and a GERAN cell for reselection, which the
+// phone does not measure while on LTE.
+//
 // Everything depends only on the technology, the seed and the number of steps.
 
 #include <chrono>
@@ -51,6 +59,25 @@ class SimulatedNetwork {
     int quality = 0;    // Ec/N0 in dB (UMTS, UTRAN2)
     bool measured = true;
     int strongerSteps = 0;  // consecutive steps clearly above the serving cell
+
+    // LTE only. RSRP in dBm and RSRQ in dB move in half-dB steps, the finest
+    // step that every LTE record carrying them can hold.
+    int uplinkChannel = 0;   // uplink E-ARFCN
+    int resourceBlocks = 0;  // the carrier's bandwidth: 100 (20 MHz) or 50 (10 MHz)
+    double rsrp = 0;
+    double rsrq = 0;
+    double averageRsrp = 0;  // layer-3 filtered
+    double averageRsrq = 0;
+  };
+
+  // A cell of another access technology that the LTE cells name for
+  // reselection. The phone does not measure it while camped on LTE, so the
+  // cell list does not hold it.
+  struct InterRatNeighbour {
+    Access access = Access::UMTS;  // UMTS or GSM
+    int channel = 0;               // UARFCN (UMTS) or ARFCN (GSM)
+    int code = 0;                  // primary scrambling code (UMTS) or BSIC (GSM)
+    int band = 0;                  // band 1 (UMTS); the band indicator 0, DCS 1800 (GSM)
   };
 
   // Throws std::invalid_argument for a technology that is not a log-code technology.
@@ -68,6 +95,8 @@ class SimulatedNetwork {
 
   const std::vector<Cell>& cells() const { return cells_; }
   const Cell& servingCell() const { return cells_[serving_]; }
+  // Empty but for LTE.
+  const std::vector<InterRatNeighbour>& interRatNeighbours() const { return interRatNeighbours_; }
   std::uint64_t steps() const { return steps_; }
   std::uint64_t cellChanges() const { return cellChanges_; }
   // Counts the changes of the PDP contexts, so that a reporter sees when to report them again.
@@ -80,12 +109,18 @@ class SimulatedNetwork {
  private:
   void addCells(Access access, int count, int areaCode);
   void drift(Cell& cell);
+  void measureLteCell(Cell& cell);
   void changeServingCell(std::size_t to);
   std::size_t strongest(Access access) const;
   Dictionary cellFields(const Cell& cell) const;
 
   SeededRandom random_;
+  // LTE's measurement noise and inter-RAT neighbours draw from a stream of
+  // their own: the levels, cell changes, SIM and PDP contexts that a seed gives
+  // do not depend on them.
+  SeededRandom radio_;
   std::vector<Cell> cells_;
+  std::vector<InterRatNeighbour> interRatNeighbours_;
   std::size_t serving_ = 0;
   std::uint64_t steps_ = 0;
   std::uint64_t cellChanges_ = 0;

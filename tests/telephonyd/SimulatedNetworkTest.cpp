@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cmath>
 #include <cstdio>
 #include <set>
 #include <stdexcept>
@@ -290,6 +291,79 @@ TEST(SimulatedNetworkTest, PdpContextsChangeRarelyAndHoldOnlyStrings) {
   EXPECT_GT(changes, 0);
   EXPECT_LT(changes, 60);
   EXPECT_TRUE(imsSeen);
+}
+
+TEST(SimulatedNetworkTest, LteMeasurementsStayRealisticOnHalfDbStepsAndFollowTheLevel) {
+  auto onHalfDbSteps = [](double value) { return value * 2 == std::floor(value * 2); };
+  for (std::uint64_t seed = 1; seed <= 20; ++seed) {
+    SCOPED_TRACE(seed);
+    SimulatedNetwork network(kLogChannelTechnologyQuendraLTE, seed);
+    for (int step = 0; step <= 120; ++step) {
+      if (step > 0) network.step();
+      for (const auto& cell : network.cells()) {
+        EXPECT_EQ(cell.uplinkChannel, cell.channel + 18000);
+        EXPECT_EQ(cell.resourceBlocks, cell.band == 20 ? 50 : 100);
+        for (double rsrp : {cell.rsrp, cell.averageRsrp}) {
+          EXPECT_GE(rsrp, -125);
+          EXPECT_LE(rsrp, -70);
+          EXPECT_TRUE(onHalfDbSteps(rsrp)) << rsrp;
+        }
+        for (double rsrq : {cell.rsrq, cell.averageRsrq}) {
+          EXPECT_GE(rsrq, -20);
+          EXPECT_LE(rsrq, -3);
+          EXPECT_TRUE(onHalfDbSteps(rsrq)) << rsrq;
+        }
+        // RSRP lies below RSSI by the spread over the carrier's resource
+        // elements, give or take a dB, unless held at the edge of its range.
+        const double below = cell.resourceBlocks == 100 ? 28 : 25;
+        if (cell.rsrp > -125 && cell.rsrp < -70) {
+          EXPECT_LE(std::abs(cell.level - below - cell.rsrp), 1.0) << cell.level << " " << cell.rsrp;
+        }
+      }
+    }
+  }
+}
+
+TEST(SimulatedNetworkTest, LteRsrpAndRsrqDriftFromStepToStep) {
+  SimulatedNetwork network(kLogChannelTechnologyQuendraLTE, 3);
+  std::set<double> rsrps, rsrqs;
+  for (int step = 0; step < 60; ++step) {
+    network.step();
+    rsrps.insert(network.servingCell().rsrp);
+    rsrqs.insert(network.servingCell().rsrq);
+  }
+  EXPECT_GT(rsrps.size(), 10u);
+  EXPECT_GT(rsrqs.size(), 5u);
+}
+
+TEST(SimulatedNetworkTest, OnlyTheLteNetworkNamesAUtranAndAGeranCellForReselection) {
+  for (std::uint64_t seed = 1; seed <= 10; ++seed) {
+    SimulatedNetwork network(kLogChannelTechnologyQuendraLTE, seed);
+    const auto& neighbours = network.interRatNeighbours();
+    ASSERT_EQ(neighbours.size(), 2u);
+    EXPECT_EQ(neighbours[0].access, Access::UMTS);
+    EXPECT_GE(neighbours[0].channel, 10562);
+    EXPECT_LE(neighbours[0].channel, 10838);
+    EXPECT_LE(neighbours[0].code, 511);
+    EXPECT_EQ(neighbours[0].band, 1);
+    EXPECT_EQ(neighbours[1].access, Access::GSM);
+    EXPECT_GE(neighbours[1].channel, 512);
+    EXPECT_LE(neighbours[1].channel, 885);
+    EXPECT_LE(neighbours[1].code, 63);
+    EXPECT_EQ(neighbours[1].band, 0);
+    // Not measured on LTE, so not in the cell list.
+    for (const Dictionary& cell : cellsOf(network)) {
+      EXPECT_EQ(text(cell, CellMonitorCellRadioAccessTechnology), CellMonitorRadioAccessTechnologyLTE);
+    }
+  }
+  for (auto technology : {kLogChannelTechnologyQuendraGSM, kLogChannelTechnologyQuendraUTRAN2}) {
+    SimulatedNetwork network(technology, 1);
+    EXPECT_TRUE(network.interRatNeighbours().empty()) << technology;
+    for (const auto& cell : network.cells()) {
+      EXPECT_EQ(cell.resourceBlocks, 0) << technology;
+      EXPECT_EQ(cell.rsrp, 0) << technology;
+    }
+  }
 }
 
 TEST(SimulatedNetworkTest, TechnologiesWithoutLogCodeCellsAreRefused) {
