@@ -4,6 +4,7 @@
 
 #include "platform/LogChannelTechnology.h"
 #include "telephonyd/LogRecord.h"
+#include "telephonyd/LteRadioEncoder.h"
 
 namespace corvane::telephonyd {
 
@@ -76,6 +77,7 @@ std::unique_ptr<LogCodeSimulator> makeLogCodeScenario(std::string_view technolog
   if (!isLogCodeTechnology(technology)) return nullptr;
   auto scenario = std::make_unique<LogCodeSimulator>(technology, seed, clockStart);
   scenario->addEncoder(std::make_unique<ExtraCodeEncoder>());
+  if (technology == kLogChannelTechnologyQuendraLTE) scenario->addEncoder(std::make_unique<LteRadioEncoder>());
   return scenario;
 }
 

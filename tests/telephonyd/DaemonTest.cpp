@@ -12,6 +12,7 @@
 #include <chrono>
 #include <cstring>
 #include <filesystem>
+#include <set>
 #include <thread>
 
 #include "LogGenerator/GSM/GSMLogGenerator.h"
@@ -271,6 +272,27 @@ TEST_F(DaemonTest, LogCodeTechnologyStreamsOnlyTheCellListsThatTheStartCommandAs
               Value("CellMonitorRadioAccessTechnologyLTE"));
     EXPECT_EQ(serving.asDictionary()->get("CellMonitorCellType"), Value("CellMonitorCellTypeServing"));
   }
+}
+
+TEST_F(DaemonTest, LteScenarioStreamsOnlyTheRadioRecordsThatTheStartCommandAsksFor) {
+  Daemon daemon(ports, {"--technology", "Quendra_LTE", "--rate", "max", "--packets", "40"});
+  Client client(ports, loop);
+  ASSERT_TRUE(client.connected());
+  client.keepAll = true;
+  ASSERT_EQ(client.technology(), "Quendra_LTE");
+  ASSERT_EQ(client.start(logCodeStart({0xB17F, 0xB186}, {})), kPortSuccess);
+  ASSERT_TRUE(pumpUntil([&] { return client.all.size() >= 40; }));
+  pumpFor(50ms);
+  ASSERT_EQ(client.all.size(), 40u);
+  std::set<std::uint32_t> codes;
+  for (const Bytes& packet : client.all) {
+    ASSERT_GE(packet.size(), 13u);
+    EXPECT_EQ(packet[0], 0x01);
+    EXPECT_EQ(packet[1] | packet[2] << 8, static_cast<int>(packet.size() - 1));
+    codes.insert(effectiveCode(packet));
+  }
+  // Serving measurements every 320 ms, reselection candidates every 1280 ms.
+  EXPECT_EQ(codes, (std::set<std::uint32_t>{0xB17F, 0xB186}));
 }
 
 TEST_F(DaemonTest, StartCommandWithAnotherTechnologysCodesGetsNothingOfThem) {

@@ -155,12 +155,14 @@ class EveryOtherPeriodEncoder final : public LogCodeSimulator::Encoder {
 };
 
 TEST(LogCodeSimulatorTest, FurtherEncodersJoinTheScheduleInPeriodOrder) {
-  auto scenario = makeLogCodeScenario(kLogChannelTechnologyQuendraLTE, 1, kStart);
-  scenario->addEncoder(std::make_unique<EveryOtherPeriodEncoder>());
+  // Without the LTE scenario's radio encoder, so that the test encoder's are the only log codes.
+  LogCodeSimulator scenario(kLogChannelTechnologyQuendraLTE, 1, kStart);
+  scenario.addEncoder(std::make_unique<ExtraCodeEncoder>());
+  scenario.addEncoder(std::make_unique<EveryOtherPeriodEncoder>());
   std::vector<std::uint32_t> codes;
   std::vector<std::uint64_t> times;
   for (int i = 0; i < 6; ++i) {
-    const SourcePacket packet = scenario->nextPacket();
+    const SourcePacket packet = scenario.nextPacket();
     codes.push_back(*packet.code);
     times.push_back(recordOf(*packet.data).timestamp - kStart);
   }
@@ -207,7 +209,8 @@ TEST(LogCodeSimulatorTest, StartCommandForExtraCodeOneStreamsOnlyCellLists) {
   command.set("SetState", Value("Streaming"));
   command.set("SetQuendraLogCodes", integers({}));
   command.set("SetTsExtraCodes", integers({1}));
-  const auto codes = streamedCodes(kLogChannelTechnologyQuendraLTE, command, 300);
+  // About 320 simulated seconds of the LTE scenario, radio records included.
+  const auto codes = streamedCodes(kLogChannelTechnologyQuendraLTE, command, 3000);
   EXPECT_GT(codes.size(), 200u);
   for (std::uint32_t code : codes) EXPECT_EQ(code, 0xFF0001u);
 }
