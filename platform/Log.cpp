@@ -38,12 +38,26 @@ void SyslogSink::write(int priority, std::string_view text) {
   syslog(priority, "%.*s", static_cast<int>(text.size()), text.data());
 }
 
+bool SyslogSink::wants(int priority) const {
+  // setlogmask(0) reads the mask without changing it.
+  return (setlogmask(0) & LOG_MASK(LOG_PRI(priority))) != 0;
+}
+
 void StderrSink::write(int priority, std::string_view text) {
   std::fprintf(stderr, "<%d> %.*s\n", priority, static_cast<int>(text.size()), text.data());
 }
 
 void TeeSink::write(int priority, std::string_view text) {
-  for (auto& s : sinks_) s->write(priority, text);
+  for (auto& s : sinks_) {
+    if (s->wants(priority)) s->write(priority, text);
+  }
+}
+
+bool TeeSink::wants(int priority) const {
+  for (const auto& s : sinks_) {
+    if (s->wants(priority)) return true;
+  }
+  return false;
 }
 
 void CapturingSink::write(int priority, std::string_view text) {
@@ -86,16 +100,23 @@ std::shared_ptr<Sink> sink() {
   return currentSink();
 }
 
+bool wants(int priority) {
+  const auto s = sink();
+  return s && s->wants(priority);
+}
+
 void write(int priority, std::string_view text) {
-  if (auto s = sink()) s->write(priority, text);
+  if (auto s = sink(); s && s->wants(priority)) s->write(priority, text);
 }
 
 void printf(int priority, const char* fmt, ...) {
+  const auto s = sink();
+  if (!s || !s->wants(priority)) return;
   va_list args;
   va_start(args, fmt);
   std::string text = vformat(fmt, args);
   va_end(args);
-  write(priority, text);
+  s->write(priority, text);
 }
 
 std::string format(const char* fmt, ...) {

@@ -21,12 +21,19 @@ class Sink {
  public:
   virtual ~Sink() = default;
   virtual void write(int priority, std::string_view text) = 0;
+  // Whether the sink records lines of this priority. A line no sink wants is
+  // never formatted, which keeps per-packet traces cheap when nobody reads
+  // them; a sink that records a priority must say so here.
+  virtual bool wants(int /*priority*/) const { return true; }
 };
 
 class SyslogSink final : public Sink {
  public:
   SyslogSink();
   void write(int priority, std::string_view text) override;
+  // What the process's syslog mask lets through (all priorities unless
+  // setlogmask(3) narrowed it); syslog(3) would drop the rest anyway.
+  bool wants(int priority) const override;
 };
 
 // Writes "<priority> <text>" lines to standard error.
@@ -35,11 +42,12 @@ class StderrSink final : public Sink {
   void write(int priority, std::string_view text) override;
 };
 
-// Sends every line to each of its sinks.
+// Sends every line to each of its sinks that wants it.
 class TeeSink final : public Sink {
  public:
   explicit TeeSink(std::vector<std::shared_ptr<Sink>> sinks) : sinks_(std::move(sinks)) {}
   void write(int priority, std::string_view text) override;
+  bool wants(int priority) const override;
 
  private:
   std::vector<std::shared_ptr<Sink>> sinks_;
@@ -70,6 +78,9 @@ class CapturingSink final : public Sink {
 void setSink(std::shared_ptr<Sink> sink);
 std::shared_ptr<Sink> sink();
 
+// Whether the current sink wants lines of this priority; write and printf
+// ask it themselves.
+bool wants(int priority);
 void write(int priority, std::string_view text);
 void printf(int priority, const char* format, ...) __attribute__((format(printf, 2, 3)));
 std::string format(const char* format, ...) __attribute__((format(printf, 1, 2)));

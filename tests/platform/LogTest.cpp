@@ -1,6 +1,7 @@
 #include "platform/Log.h"
 
 #include <gtest/gtest.h>
+#include <syslog.h>
 
 namespace corvane {
 namespace {
@@ -35,6 +36,53 @@ TEST(Log, TeeSinkWritesToEverySink) {
   tee.write(5, "both");
   EXPECT_EQ(a->lines(), b->lines());
   EXPECT_EQ(a->count("both"), 1u);
+}
+
+// Takes only failures (levels 0-3), as a sink that ignores traces would.
+class ErrorsOnlySink final : public log::Sink {
+ public:
+  void write(int priority, std::string_view text) override { lines.push_back({priority, std::string(text)}); }
+  bool wants(int priority) const override { return priority <= log::kError; }
+  std::vector<log::Line> lines;
+};
+
+TEST(Log, LinesTheSinkDoesNotWantAreNeverHandedToIt) {
+  auto errors = std::make_shared<ErrorsOnlySink>();
+  auto previous = log::sink();
+  log::setSink(errors);
+  log::printf(log::kWarning, "trace %d", 1);
+  log::write(log::kWarning, "trace");
+  log::printf(log::kError, "failure %d", 2);
+  log::write(log::kError, "failure");
+  EXPECT_FALSE(log::wants(log::kWarning));
+  EXPECT_TRUE(log::wants(log::kError));
+  log::setSink(previous);
+  EXPECT_EQ(errors->lines, (std::vector<log::Line>{{3, "failure 2"}, {3, "failure"}}));
+}
+
+TEST(Log, ATeeWantsWhatAnyOfItsSinksWantsAndHandsEachOnlyThat) {
+  auto all = std::make_shared<log::CapturingSink>();
+  auto errors = std::make_shared<ErrorsOnlySink>();
+  log::TeeSink tee({all, errors});
+  EXPECT_TRUE(tee.wants(log::kWarning));
+  tee.write(log::kWarning, "trace");
+  tee.write(log::kError, "failure");
+  EXPECT_EQ(all->texts(), (std::vector<std::string>{"trace", "failure"}));
+  EXPECT_EQ(errors->lines, (std::vector<log::Line>{{3, "failure"}}));
+  EXPECT_FALSE(log::TeeSink({errors}).wants(log::kWarning));
+}
+
+TEST(Log, TheSyslogSinkWantsWhatTheSyslogMaskLetsThrough) {
+  log::SyslogSink syslogSink;
+  EXPECT_TRUE(syslogSink.wants(log::kWarning));
+  EXPECT_TRUE(syslogSink.wants(16));
+  const int previous = setlogmask(LOG_UPTO(LOG_ERR));
+  EXPECT_FALSE(syslogSink.wants(log::kWarning));
+  EXPECT_FALSE(syslogSink.wants(log::kNotice));
+  EXPECT_TRUE(syslogSink.wants(log::kError));
+  // 16 carries no level bits of its own: it is level 0 to the mask.
+  EXPECT_TRUE(syslogSink.wants(16));
+  setlogmask(previous);
 }
 
 TEST(Log, PointersShowAsHexWithNullAsZero) {
