@@ -1,14 +1,16 @@
 #!/usr/bin/env bash
 # Runs every fuzz target of a fuzz build for the given number of seconds,
 # starting from the seed corpus in fuzz/corpus. Fails on the first finding.
-# Usage: scripts/fuzz.sh BUILD_DIR SECONDS
+# Usage: scripts/fuzz.sh BUILD_DIR SECONDS [NAME_GLOB]
+# NAME_GLOB picks targets by name without the _fuzzer suffix ('lte_*': the LTE sections).
 set -euo pipefail
 cd "$(dirname "$0")/.."
 build=${1:?build directory}
 seconds=${2:-60}
+only=${3:-*}
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
-for target in "$build"/fuzz/*_fuzzer; do
+for target in "$build"/fuzz/${only}_fuzzer; do
   name=$(basename "$target")
   mkdir -p "$work/$name"
   cp fuzz/corpus/*/* "$work/$name/" 2>/dev/null || true
