@@ -4,6 +4,10 @@
 
 #include <gtest/gtest.h>
 
+#include <map>
+#include <string>
+#include <vector>
+
 #include <nlohmann/json.hpp>
 
 #include "support/Process.h"
