@@ -1,7 +1,9 @@
 #include "app/NavigationController.h"
 
+#include <QFontMetrics>
 #include <QHBoxLayout>
 #include <QLabel>
+#include <QPainter>
 #include <QShortcut>
 #include <QStackedLayout>
 #include <QStackedWidget>
@@ -13,6 +15,28 @@
 #include "app/Theme.h"
 
 namespace corvane {
+
+namespace {
+
+constexpr int kMaximumBackTextWidth = 130;
+
+// A title that is cut short with an ellipsis where the bar is too narrow; its
+// text stays whole.
+class TitleLabel final : public QLabel {
+ public:
+  using QLabel::QLabel;
+
+ protected:
+  void paintEvent(QPaintEvent*) override {
+    QPainter painter(this);
+    painter.setFont(font());
+    painter.setPen(palette().color(QPalette::WindowText));
+    const QString shown = fontMetrics().elidedText(text(), Qt::ElideRight, contentsRect().width());
+    painter.drawText(contentsRect(), static_cast<int>(alignment()), shown);
+  }
+};
+
+}  // namespace
 
 namespace {
 
@@ -101,16 +125,17 @@ NavigationController::NavigationController(ViewController* rootViewController, Q
   _backButton->setAutoRaise(true);
   _backButton->setFocusPolicy(Qt::NoFocus);
   connect(_backButton, &QToolButton::clicked, this, [this] { popViewControllerAnimated(true); });
-  _titleLabel = new QLabel(_navigationBar);
+  _titleLabel = new TitleLabel(_navigationBar);
   _titleLabel->setObjectName(QStringLiteral("NavigationTitle"));
   _titleLabel->setFont(theme::boldSystemFont(17));
   _titleLabel->setAlignment(Qt::AlignCenter);
   _titleLabel->setTextFormat(Qt::PlainText);
+  // A long title is clipped, never widening the window (section names such as
+  // "Connected mode LTE Intra-frequency Measurement" are wider than a phone).
+  _titleLabel->setSizePolicy(QSizePolicy::Ignored, QSizePolicy::Preferred);
   _titleBalance = new QWidget(_navigationBar);
   bar->addWidget(_backButton);
-  bar->addStretch(1);
-  bar->addWidget(_titleLabel);
-  bar->addStretch(1);
+  bar->addWidget(_titleLabel, 1);
   bar->addWidget(_titleBalance);
 
   _screens = new QStackedWidget(_stackPage);
@@ -221,6 +246,11 @@ QString NavigationController::backButtonText() const {
   return _backButton->isHidden() ? QString() : _backButton->text();
 }
 
+void NavigationController::resizeEvent(QResizeEvent* event) {
+  QWidget::resizeEvent(event);
+  updateBar();
+}
+
 void NavigationController::showEvent(QShowEvent* event) {
   QWidget::showEvent(event);
   if (_appeared) return;
@@ -231,15 +261,24 @@ void NavigationController::showEvent(QShowEvent* event) {
 
 void NavigationController::updateBar() {
   _titleLabel->setText(topViewController()->title());
+  _titleLabel->setToolTip(topViewController()->title());
   if (_viewControllers.size() < 2) {
     _backButton->hide();
     _titleBalance->setFixedWidth(0);
     return;
   }
   const QString previous = _viewControllers[_viewControllers.size() - 2]->title();
-  _backButton->setText(QStringLiteral("\u2039 ") + (previous.isEmpty() ? tr("Back") : previous));
+  const QString full = QStringLiteral("\u2039 ") + (previous.isEmpty() ? tr("Back") : previous);
+  // The back button keeps room for the title: a long name is cut short.
+  _backButton->setText(QFontMetrics(_backButton->font()).elidedText(full, Qt::ElideRight, kMaximumBackTextWidth));
+  _backButton->setToolTip(full);
   _backButton->show();
-  _titleBalance->setFixedWidth(_backButton->sizeHint().width());
+  // The balance keeps the title centred while there is room; a long title
+  // takes the balance's room first.
+  const int back = _backButton->sizeHint().width();
+  const int title = QFontMetrics(_titleLabel->font()).horizontalAdvance(_titleLabel->text());
+  const int room = _navigationBar->width() - 8 - back;
+  _titleBalance->setFixedWidth(std::clamp(room - title, 0, back));
 }
 
 }  // namespace corvane

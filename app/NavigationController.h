@@ -118,6 +118,7 @@ class NavigationController final : public QWidget {
 
  protected:
   void showEvent(QShowEvent* event) override;
+  void resizeEvent(QResizeEvent* event) override;
 
  private:
   void willShow(ViewController* viewController, bool animated);

@@ -226,8 +226,12 @@ int main(int argc, char** argv) {
   };
 
   std::string spawnError;
-  const pid_t service = spawn({serviceProgram.string(), "--technology", technology, "--seed", seed}, environment,
-                              spawnError);
+  std::vector<std::string> serviceArguments = {serviceProgram.string(), "--technology", technology, "--seed", seed};
+  // The log-code scenarios send several records per simulated second; this
+  // pace plays them at about real time (the service's default suits the IFX
+  // scenario's one report per half second).
+  if (technology != "IFX") serviceArguments.insert(serviceArguments.end(), {"--rate", "10"});
+  const pid_t service = spawn(serviceArguments, environment, spawnError);
   if (service < 0) {
     cleanUp(-1);
     return fail(spawnError);

@@ -34,7 +34,10 @@ class ScreenshotTest : public QObject {
   bool keep(QWidget* window, const QString& name) {
     QCoreApplication::processEvents();
     const QImage image = window->grab().toImage();
-    if (image.isNull() || image.size() != QSize(kWindowWidth, kWindowHeight)) return false;
+    if (image.isNull() || image.size() != QSize(kWindowWidth, kWindowHeight)) {
+      qWarning("screenshot %s is %dx%d", qPrintable(name), image.width(), image.height());
+      return false;
+    }
     QStringList directories{QStringLiteral(CORVANE_SCREENSHOT_BUILD_DIR)};
     if (qEnvironmentVariable("CORVANE_UPDATE_SCREENSHOTS") == QLatin1String("1")) {
       directories << QStringLiteral(CORVANE_SOURCE_DIR "/docs/screenshots");
@@ -116,6 +119,118 @@ class ScreenshotTest : public QObject {
       const Value snapshot = plist::parseOrThrow(bytes);
       QVERIFY(snapshot.asDictionary() && snapshot.asDictionary()->get("Data").isArray());
       QCOMPARE(*snapshot.asDictionary()->find("Description")->asString(), std::string("Drive test, north ring road"));
+    }
+    test::stopProcess(service, SIGTERM);
+    ::unsetenv("CORVANE_RUNTIME_DIR");
+  }
+
+  // Every LTE screen shows decoded values (no template placeholder left) and
+  // they change from one display update to a later one.
+  void theLteScenarioShowsLiveChangingValuesOnEveryLteScreen() {
+    test::TemporaryDirectory directory;
+    const std::string runtime = directory.path() + "/run";
+    const std::filesystem::path root = directory.path() + "/device";
+    ::setenv("CORVANE_RUNTIME_DIR", runtime.c_str(), 1);
+
+    std::string error;
+    std::unique_ptr<SocketModelEnvironment> platform = SocketModelEnvironment::create(error);
+    QVERIFY2(platform, error.c_str());
+    const int service = test::startProcess({kService, "--technology", "Quendra_LTE", "--seed", "3", "--rate", "10"},
+                                           {"CORVANE_RUNTIME_DIR=" + runtime}, directory.path() + "/service.log");
+    QTRY_VERIFY_WITH_TIMEOUT(std::filesystem::exists(runtime + "/corvane-telephonyd.sock"), 10000);
+
+    Preferences preferences(QString::fromStdString(directory.path() + "/config"));
+    {
+      CorvaneApp app(CorvaneAppEnvironment{platform->environment(), preferences, root});
+      app.applicationDidFinishLaunching();
+      QWidget* window = app.window();
+      window->resize(kWindowWidth, kWindowHeight);
+      QVERIFY(QTest::qWaitForWindowExposed(window));
+      NavigationController* navigation = app.navigationController();
+      auto top = [&] { return qobject_cast<CorvanePaneController*>(navigation->topViewController()); };
+      QTRY_VERIFY_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 4, 20000);
+      QCOMPARE(test::cellAt(top(), 0)->key()->text(), QStringLiteral("Serving Cell"));
+      QVERIFY(keep(window, QStringLiteral("lte-root")));
+
+      // The text of every row of the top screen, key and value.
+      auto rowsOf = [&] {
+        QStringList rows;
+        for (int i = 0; i < top()->tableView()->numberOfRows(); ++i) {
+          rows << test::cellAt(top(), i)->key()->text() + QLatin1Char('=') + test::cellAt(top(), i)->value()->text();
+        }
+        return rows;
+      };
+      // Rows all hold decoded values: none is empty or the template's "-".
+      auto decoded = [&] {
+        if (top()->tableView()->numberOfRows() == 0) return false;
+        for (int i = 0; i < top()->tableView()->numberOfRows(); ++i) {
+          const QString value = test::cellAt(top(), i)->value()->text();
+          if (value.isEmpty() || value == QLatin1String("-")) return false;
+        }
+        return true;
+      };
+      auto open = [&](const QString& key) {
+        const int row = test::rowWithKey(top(), key);
+        if (row < 0) return false;
+        test::tapRow(top(), row);
+        return true;
+      };
+      auto waitForUpdate = [&] {
+        const QString status = test::statusTextOf(top());
+        QTRY_VERIFY_WITH_TIMEOUT(test::statusTextOf(top()) != status, 10000);
+      };
+
+      struct Screen {
+        QString group;
+        QString section;
+        const char* picture;
+        bool list;
+        bool moves;  // measurements: they change between updates
+      };
+      const Screen screens[] = {
+          {QStringLiteral("Serving Cell"), QStringLiteral("Serving Cell Info"), "lte-serving-cell-info", false, false},
+          {QStringLiteral("Serving Cell"), QStringLiteral("Serving Cell Measurements"), "lte-serving-cell-measurements",
+           false, true},
+          {QStringLiteral("Neighbours"), QStringLiteral("Connected mode LTE Intra-frequency Measurement"), nullptr,
+           false, true},
+          {QStringLiteral("Neighbours"), QStringLiteral("Measured Neighbor Cells"), nullptr, true, true},
+          {QStringLiteral("Neighbours"), QStringLiteral("Neighbor Measurements"), nullptr, false, false},
+          {QStringLiteral("Neighbours"), QStringLiteral("Neighbor Cells List"), "lte-neighbor-cells-list", true, true},
+          {QStringLiteral("Reselection"), QStringLiteral("Reselection Candidates"), nullptr, false, false},
+          {QStringLiteral("Reselection"), QStringLiteral("Reselection Candidates List"), "lte-reselection-candidates",
+           true, false},
+      };
+      // "Detected Cells" lists only neighbours found but not measured, which
+      // come and go; its screen opens whether or not it holds one now.
+      navigation->popToViewController(navigation->viewControllers().front(), false);
+      QVERIFY(open(QStringLiteral("Neighbours")));
+      QVERIFY(open(QStringLiteral("Detected Cells")));
+      QCOMPARE(top()->path(), std::string("/Neighbours/Detected Cells"));
+
+      for (const Screen& screen : screens) {
+        navigation->popToViewController(navigation->viewControllers().front(), false);
+        QVERIFY2(open(screen.group), qPrintable(screen.group));
+        QVERIFY2(open(screen.section), qPrintable(screen.section));
+        // A list shows its first entry; rows show their values.
+        if (screen.list) {
+          QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 1, qPrintable(screen.section), 10000);
+          if (screen.picture) QVERIFY(keep(window, QString::fromLatin1(screen.picture) + QStringLiteral("-list")));
+          QVERIFY(open(QStringLiteral("0")));
+        }
+        QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(screen.section + QStringLiteral(": ") +
+                                                         rowsOf().join(QStringLiteral(", "))),
+                                  10000);
+        const QStringList before = rowsOf();
+        if (screen.picture) QVERIFY(keep(window, QString::fromLatin1(screen.picture)));
+        if (!screen.moves) continue;
+        // Values move: within a few updates some row of this screen differs.
+        bool changed = false;
+        for (int i = 0; i < 5 && !changed; ++i) {
+          waitForUpdate();
+          changed = rowsOf() != before;
+        }
+        QVERIFY2(changed, qPrintable(screen.section + QStringLiteral(": ") + before.join(QStringLiteral(", "))));
+      }
     }
     test::stopProcess(service, SIGTERM);
     ::unsetenv("CORVANE_RUNTIME_DIR");
