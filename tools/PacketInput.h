@@ -16,16 +16,18 @@
 // timestamp, payload; little-endian. Records read from DLF files become packets
 // with the type byte put back.
 //
-// DLF. Records follow one another. Files written by other tools hold records
-// only; a DLF saved by the application keeps the type bytes of all but the first
-// packet of each display interval, so a 0x01 or 0xFF may stand before a record.
-// Where a byte could be either a type byte or the start of a record, the reader
-// takes the reading that splits the file into the most whole records (a wrong
-// choice swallows the records that follow into one long bogus record); on a tie,
-// the record without a type byte. A record read without its type byte is an
-// extra code when its payload is a binary property list ("bplist00"), else an
-// ordinary one. Version report records (code 0x1FFD, written first) are not
-// packets and are skipped.
+// DLF. Records follow one another; each becomes a packet of type 0x01, or 0xFF
+// when its payload is a binary property list ("bplist00"), as only extra codes
+// carry one. Version reports (code 0x1FFD) are not packets and are skipped.
+// A DLF that this application saved opens with its version report (161 bytes,
+// "EXECUTABLE_NAME" at offset 23) and keeps the type bytes of all but the first
+// packet of each display interval, so a 0x01 or 0xFF may stand before a record
+// there. Of all the ways to read such a file, the reader takes the one that
+// ends at the end of the file (else at a record cut off by it), with the most
+// records, then the fewest records without a type byte; on a tie, the record
+// without a type byte. Taking each record as it comes fails: 0x01 0x20 also
+// reads as a record of 8193 bytes, which fits in any larger file and swallows
+// the records behind it. Other DLFs are read record after record.
 //
 // Snapshot. Every entry of "Data" that holds "DisplayState" contributes its
 // packets, in order: a property list (or a "DisplayState" that is not data) is

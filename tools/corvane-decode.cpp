@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "LogGenerator/LogGenerator.h"
+#include "LogGenerator/logcode/ClassIndex.h"
 #include "PacketInput.h"
 #include "CommandLine.h"
 #include "TreePrinter.h"
@@ -43,9 +44,11 @@ void printHelp() {
       "                 record, 16-bit code, 8-byte timestamp, payload), each\n"
       "                 replayed as a packet of type 0x01, or 0xFF when its payload\n"
       "                 is a binary property list; version reports (code 0x1FFD)\n"
-      "                 are skipped. Where a 0x01 or 0xFF byte may be a packet's\n"
-      "                 type byte kept in the file, the reading that gives the most\n"
-      "                 whole records wins (on a tie: no type byte)\n"
+      "                 are skipped. In a DLF that the application saved, a 0x01\n"
+      "                 or 0xFF may be a packet's type byte kept in the file: the\n"
+      "                 reading of the whole file with the most records wins, then\n"
+      "                 the one with the fewest records without a type byte (on a\n"
+      "                 tie: no type byte)\n"
       "  hex text       one packet per line in hex, exactly as the telephony\n"
       "                 service delivers it; blanks and colons may stand between\n"
       "                 bytes, blank lines and lines starting with # are skipped\n"
@@ -80,6 +83,8 @@ bool isKnownTechnology(const std::string& name) {
 }  // namespace
 
 int main(int argc, char** argv) {
+  // Standard output carries the tree; the class indexes' teardown lines go with the diagnostics.
+  corvane::ClassIndex::setTeardownStream(stderr);
   using namespace corvane;
 
   std::string technology;

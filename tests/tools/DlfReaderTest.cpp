@@ -71,16 +71,44 @@ TEST(DlfReader, TypeBytesAreFoundAlsoWhereTheyReadAsALongRecordThatFits) {
   EXPECT_EQ(read(dlf).packets, packets);
 }
 
+TEST(DlfReader, ARecordOf257BytesBehindItsTypeByteIsNotReadOneByteEarly) {
+  // 01 | 01 01 80 B1 ...: also a record of 257 bytes, one byte early. Its last
+  // byte (0x00) and the next type byte (0x01) read as a record of 256 bytes,
+  // which here ends where the fourth packet's record begins: both readings
+  // count as many records, but that one has a record more without a type byte.
+  const Bytes lead = withType(0x01, logRecord(0xB0C1, 0, {1, 2, 3}));
+  const Bytes first = withType(0x01, logRecord(0xB180, 1, Bytes(245, 0x00)));
+  const Bytes second = withType(0x01, logRecord(0xB17F, 2, Bytes(242, 0x00)));
+  const Bytes third = withType(0x01, logRecord(0xB0C2, 3, Bytes(20, 0x00)));
+  ASSERT_EQ(first.size(), 258u);
+  ASSERT_EQ(257 + 256, first.size() + second.size());
+  EXPECT_EQ(read(dlfOfIntervals({{lead, first, second, third}})).packets,
+            (std::vector<Bytes>{lead, first, second, third}));
+}
+
 TEST(DlfReader, OnATieTheRecordWithoutATypeByteWins) {
-  // FF FE FE ...: a record of 0xFEFF bytes, or type 0xFF and a record of 0xFEFE
-  // bytes; both are one record up to the end.
-  Bytes record = logRecord(0x00FE, 0, Bytes(0xFEFF - 12, 0x00));
-  record[2] = 0xFE;
-  ASSERT_EQ(record[0], 0xFF);
-  ASSERT_EQ(record[1], 0xFE);
-  const PacketList list = read(record);
-  ASSERT_EQ(list.packets.size(), 1u);
-  EXPECT_EQ(list.packets[0], withType(0x01, record));
+  // A cell list of 257 bytes opens an interval: 01 01 01 00 ... also reads as
+  // type 0x01 and a record of 257 bytes one byte late, which takes the next
+  // packet's type byte, after which that packet reads without it: as many
+  // records, as many without a type byte.
+  Bytes payload = test::bytesOf("bplist00");
+  payload.resize(257 - 12, 0x11);
+  const Bytes cellList = withType(0xFF, logRecord(0x0001, 1, payload));
+  const Bytes next = withType(0x01, logRecord(0xB0C2, 2, {1, 2, 3}));
+  EXPECT_EQ(read(dlfOfIntervals({{cellList, next}})).packets, (std::vector<Bytes>{cellList, next}));
+}
+
+TEST(DlfReader, OtherToolsRecordsAreReadOneAfterTheOtherWhateverTheirFirstByte) {
+  // Records of 257 and 255 bytes start with 0x01 and 0xFF; without the
+  // application's version report in front, no byte is taken for a type byte.
+  const Bytes a = logRecord(0x0101, 1, Bytes(257 - 12, 0x01));
+  const Bytes b = logRecord(0x00FF, 2, Bytes(255 - 12, 0xFF));
+  ASSERT_EQ(a[0], 0x01);
+  ASSERT_EQ(b[0], 0xFF);
+  Bytes otherVersionReport = logRecord(0x1FFD, 0, Bytes(149, 0x00));
+  otherVersionReport[23] = 'x';
+  EXPECT_EQ(read(concatenated({otherVersionReport, a, b, a})).packets,
+            (std::vector<Bytes>{withType(0x01, a), withType(0x01, b), withType(0x01, a)}));
 }
 
 TEST(DlfReader, VersionReportsAreSkipped) {
