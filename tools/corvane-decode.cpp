@@ -83,8 +83,6 @@ bool isKnownTechnology(const std::string& name) {
 }  // namespace
 
 int main(int argc, char** argv) {
-  // Standard output carries the tree; the class indexes' teardown lines go with the diagnostics.
-  corvane::ClassIndex::setTeardownStream(stderr);
   using namespace corvane;
 
   std::string technology;
@@ -142,6 +140,9 @@ int main(int argc, char** argv) {
     for (auto& p : filePackets->packets) packets.push_back(std::move(p));
   }
 
+  // Standard output carries the tree: the class indexes' teardown lines go
+  // with the diagnostics under --log, and nowhere otherwise.
+  ClassIndex::setTeardownStream(logToStderr ? stderr : nullptr);
   if (logToStderr) {
     tools::copyLogToStandardError();
   }

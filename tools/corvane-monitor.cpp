@@ -16,6 +16,7 @@
 #include <unistd.h>
 
 #include "CommandLine.h"
+#include "LogGenerator/logcode/ClassIndex.h"
 #include "TreePrinter.h"
 #include "model/CorvaneModel.h"
 #include "model/SocketModelEnvironment.h"
@@ -135,6 +136,9 @@ int main(int argc, char** argv) {
     std::fprintf(stderr, "corvane-monitor: %s\n", error.c_str());
     return kExitFailure;
   }
+  // Standard output carries the tree: the class indexes' teardown lines go
+  // with the diagnostics under --log, and nowhere otherwise.
+  ClassIndex::setTeardownStream(logToStderr ? stderr : nullptr);
   if (logToStderr) {
     tools::copyLogToStandardError();
   }

@@ -6,9 +6,22 @@
 
 namespace corvane {
 
+namespace {
+std::FILE* teardownStream = stdout;
+}  // namespace
+
+void ClassIndex::setTeardownStream(std::FILE* stream) { teardownStream = stream; }
+
+void ClassIndex::printTeardownLine(const char* line) {
+  std::FILE* out = teardownStream;
+  if (!out) return;
+  std::fputs(line, out);
+  std::fputc('\n', out);
+  std::fflush(out);
+}
+
 ClassIndex::~ClassIndex() {
-  std::puts("Deallocing ClassIndex");
-  std::fflush(stdout);
+  printTeardownLine("Deallocing ClassIndex");
   classDict.clear();
   codeDictionary.clear();
 }

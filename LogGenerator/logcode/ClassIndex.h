@@ -7,6 +7,7 @@
 // registries do not change.
 
 #include <cstdint>
+#include <cstdio>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -30,6 +31,12 @@ class ClassIndex {
   void status() const;
   // Every subscribed code as a decimal string, in the order of first subscription.
   std::vector<std::string> getAllLogCodes() const;
+  // Teardown lines ("Deallocing ClassIndex" ...) go to standard output; a tool
+  // whose standard output carries a document sends them elsewhere, or nowhere
+  // (nullptr).
+  static void setTeardownStream(std::FILE* stream);
+  static void printTeardownLine(const char* line);
+
   // The names of the registered sections (order unspecified).
   std::vector<std::string> sectionNames() const;
 

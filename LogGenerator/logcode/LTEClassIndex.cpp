@@ -31,8 +31,7 @@ LTEClassIndex::LTEClassIndex() {
 }
 
 LTEClassIndex::~LTEClassIndex() {
-  std::puts("Deallocing LTEClassIndex");
-  std::fflush(stdout);
+  printTeardownLine("Deallocing LTEClassIndex");
   objLTEServingCellInfo.reset();
   objConnectedModeMeasurementMisc.reset();
   objMeasuredNeighborCells.reset();

@@ -17,8 +17,7 @@ QND_GSMClassIndex::QND_GSMClassIndex() {
 }
 
 QND_GSMClassIndex::~QND_GSMClassIndex() {
-  std::puts("Deallocing QND_GSMClassIndex");
-  std::fflush(stdout);
+  printTeardownLine("Deallocing QND_GSMClassIndex");
   objCodingScheme.reset();
   objPDPContextList.reset();
   objCellChangeCounter.reset();
