@@ -19,12 +19,16 @@ std::shared_ptr<Sink>& currentSink() {
   return s;
 }
 
+// One formatting pass for the usual short line; a longer one is measured by
+// that pass and formatted again at its size.
 __attribute__((format(printf, 1, 0))) std::string vformat(const char* fmt, va_list args) {
+  char line[256];
   va_list copy;
   va_copy(copy, args);
-  const int n = std::vsnprintf(nullptr, 0, fmt, copy);
+  const int n = std::vsnprintf(line, sizeof line, fmt, copy);
   va_end(copy);
   if (n <= 0) return {};
+  if (static_cast<std::size_t>(n) < sizeof line) return std::string(line, static_cast<std::size_t>(n));
   std::string out(static_cast<std::size_t>(n) + 1, '\0');
   std::vsnprintf(out.data(), out.size(), fmt, args);
   out.resize(static_cast<std::size_t>(n));

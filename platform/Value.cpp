@@ -35,6 +35,29 @@ struct Dictionary::Storage {
     return -1;
   }
 
+  // The value under the key, tried first at `next`; on success `next` moves
+  // behind it.
+  Value* findFrom(std::string_view key, std::size_t& next) {
+    std::ptrdiff_t at = -1;
+    if (next < entries.size() && entries[next].first == key) {
+      at = static_cast<std::ptrdiff_t>(next);
+    } else {
+      at = position(key);
+    }
+    if (at < 0) return nullptr;
+    next = static_cast<std::size_t>(at) + 1;
+    return &entries[static_cast<std::size_t>(at)].second;
+  }
+
+  void append(std::string_view key, Value value) {
+    entries.emplace_back(std::string(key), std::move(value));
+    if (index) {
+      index->emplace(entries.back().first, entries.size() - 1);
+    } else if (entries.size() > kIndexThreshold) {
+      rebuildIndex();
+    }
+  }
+
   void rebuildIndex() {
     if (entries.size() <= kIndexThreshold) {
       index.reset();
@@ -81,12 +104,27 @@ void Dictionary::set(std::string_view key, Value value) const {
     *existing = std::move(value);
     return;
   }
-  Storage& s = *storage_;
-  s.entries.emplace_back(std::string(key), std::move(value));
-  if (s.index) {
-    s.index->emplace(s.entries.back().first, s.entries.size() - 1);
-  } else if (s.entries.size() > kIndexThreshold) {
-    s.rebuildIndex();
+  storage_->append(key, std::move(value));
+}
+
+void Dictionary::set(std::string_view key, Value value, std::size_t& next) const {
+  if (Value* existing = storage_->findFrom(key, next)) {
+    *existing = std::move(value);
+    return;
+  }
+  storage_->append(key, std::move(value));
+  next = storage_->entries.size();
+}
+
+void Dictionary::setString(std::string_view key, std::string_view text, std::size_t& next) const {
+  Value* existing = storage_->findFrom(key, next);
+  if (!existing) {
+    storage_->append(key, Value(text));
+    next = storage_->entries.size();
+  } else if (auto* string = std::get_if<std::string>(&existing->v_)) {
+    string->assign(text);
+  } else {
+    *existing = Value(text);
   }
 }
 
@@ -107,11 +145,7 @@ void Dictionary::reserve(std::size_t count) const { storage_->entries.reserve(co
 
 const std::vector<Dictionary::Entry>& Dictionary::entries() const { return storage_->entries; }
 
-Dictionary Dictionary::shallowCopy() const {
-  Dictionary copy;
-  copy.storage_ = std::make_shared<Storage>(*storage_);
-  return copy;
-}
+Dictionary Dictionary::shallowCopy() const { return Dictionary(std::make_shared<Storage>(*storage_)); }
 
 Dictionary Dictionary::deepCopy() const {
   Dictionary copy;

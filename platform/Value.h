@@ -52,6 +52,13 @@ class Dictionary {
 
   // Replaces the value in place when the key exists, else appends the entry.
   void set(std::string_view key, Value value) const;
+  // The same, for a writer that sets the same keys in the same order over and
+  // over: `next` carries the position behind the key set last, where the next
+  // key is tried before the dictionary is searched. Start it at 0.
+  void set(std::string_view key, Value value, std::size_t& next) const;
+  // Sets a string, written into the string already under the key when there
+  // is one (no new string is made), with a position hint as above.
+  void setString(std::string_view key, std::string_view text, std::size_t& next) const;
   bool remove(std::string_view key) const;
   void clear() const;
   void reserve(std::size_t count) const;
@@ -179,6 +186,8 @@ class Value {
 
   // Structural equality: containers compare by contents, in order.
   friend bool operator==(const Value& a, const Value& b);
+  // Writes strings in place (Dictionary::setString).
+  friend class Dictionary;
 
  private:
   std::variant<std::monostate, std::string, std::int64_t, double, bool, corvane::Date, Bytes, Dictionary, Array> v_;

@@ -85,6 +85,15 @@ TEST(Log, TheSyslogSinkWantsWhatTheSyslogMaskLetsThrough) {
   setlogmask(previous);
 }
 
+TEST(Log, LinesLongerThanTheUsualAreFormattedWhole) {
+  log::ScopedCapture capture;
+  const std::string longText(1000, 'x');
+  log::printf(log::kError, "%s|%d", longText.c_str(), 42);
+  log::printf(log::kError, "%s", std::string(255, 'y').c_str());
+  log::printf(log::kError, "%s", std::string(256, 'z').c_str());
+  EXPECT_EQ(capture.texts(), (std::vector<std::string>{longText + "|42", std::string(255, 'y'), std::string(256, 'z')}));
+}
+
 TEST(Log, PointersShowAsHexWithNullAsZero) {
   EXPECT_EQ(log::pointerText(nullptr), "0x0");
   EXPECT_EQ(log::pointerText(reinterpret_cast<const void*>(0x55d0c0ffee10)), "0x55d0c0ffee10");

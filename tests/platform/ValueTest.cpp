@@ -105,6 +105,44 @@ TEST(Array, TwoHoldersSeeTheSameChangesAndRemoveFirstStopsAtTheEnd) {
   EXPECT_THROW((void)a.at(0), std::out_of_range);
 }
 
+TEST(Value, ASetWithAPositionHintEndsAsAPlainSetWould) {
+  Dictionary hinted;
+  Dictionary plain;
+  for (const char* key : {"a", "b", "c", "d", "e", "f", "g", "h", "i", "j", "k", "l", "m", "n"}) {
+    hinted.set(key, S("-"));
+    plain.set(key, S("-"));
+  }
+  // In order, out of order, a new key, after a removal, with the index built.
+  const std::vector<std::string> writes = {"a", "b", "c", "n", "d", "new", "a", "e", "m", "f"};
+  std::size_t next = 0;
+  for (std::size_t i = 0; i < writes.size(); ++i) {
+    if (writes[i] == "d") {
+      hinted.remove("c");
+      plain.remove("c");
+    }
+    hinted.set(writes[i], S(std::to_string(i)), next);
+    plain.set(writes[i], S(std::to_string(i)));
+    EXPECT_EQ(hinted.entries()[next - 1].first, writes[i]);
+  }
+  EXPECT_EQ(Value(hinted), Value(plain));
+  EXPECT_EQ(*hinted.find("new")->asString(), "5");
+  EXPECT_EQ(*hinted.find("a")->asString(), "6");
+}
+
+TEST(Value, SetStringWritesIntoTheStringThereOrReplacesAnythingElse) {
+  Dictionary d;
+  d.set("text", S("old"));
+  d.set("number", Value::integer(4));
+  const Dictionary shared = d;
+  std::size_t next = 0;
+  d.setString("text", "a longer text than fits in place", next);
+  EXPECT_EQ(next, 1u);
+  d.setString("number", "4 dBm", next);
+  d.setString("new", "x", next);
+  EXPECT_EQ(next, 3u);
+  EXPECT_EQ(Value(shared), D({{"text", S("a longer text than fits in place")}, {"number", S("4 dBm")}, {"new", S("x")}}));
+}
+
 TEST(Value, EqualityIsStructural) {
   EXPECT_EQ(D({{"a", A({S("x"), Value::integer(3)})}}), D({{"a", A({S("x"), Value::integer(3)})}}));
   EXPECT_NE(D({{"a", S("x")}}), D({{"a", S("y")}}));
