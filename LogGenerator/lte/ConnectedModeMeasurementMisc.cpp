@@ -17,7 +17,7 @@ void ConnectedModeMeasurementMisc::updateWithData(std::span<const std::uint8_t> 
   }
   const PacketView packet(data);
   if (packet.size() < kMinimumLength) return;
-  const lte::SectionRows rows(*this);
+  lte::RowWriter rows(*this);
   rows.set("E-ARFCN", lte::decimalText(packet.le16(17)));
   rows.set("Serving Physical Cell ID", lte::decimalText(packet.le16(19)));
   rows.set("Subframe Number", lte::decimalText(packet.le16(21)));

@@ -11,6 +11,7 @@ namespace {
 constexpr std::size_t kMinimumLength = 29;
 constexpr std::size_t kCountOffset = 28;
 constexpr std::size_t kCellSize = 2;
+const lte::RowShape kCellRow = {"Physical Cell ID"};
 }  // namespace
 
 BoundedList DetectedCells::cells(const PacketView& packet) {
@@ -31,15 +32,16 @@ void DetectedCells::updateWithData(std::span<const std::uint8_t> data, std::uint
   const lte::SectionList list(*this);
   const BoundedList detected = cells(packet);
   if (detected.count() == 0) return;
-  Array rows;
+  std::vector<Value> rows;
+  rows.reserve(detected.count());
   for (std::uint8_t i = 0; i < detected.count(); ++i) {
     const std::size_t cell = detected.entryOffset(i);
     if (!lte::entryInside(packet, cell, kCellSize)) break;
-    Dictionary row;
+    lte::RowWriter row = kCellRow.makeRow();
     row.set("Physical Cell ID", lte::decimalText(packet.le16(cell)));
-    rows.append(Value(std::move(row)));
+    rows.push_back(row.value());
   }
-  list.install(rows);
+  list.install(Array(std::move(rows)));
 }
 
 }  // namespace corvane

@@ -11,7 +11,7 @@ namespace corvane {
 
 namespace {
 
-using lte::SectionRows;
+using lte::RowWriter;
 
 constexpr std::size_t kAntennaInfoMinimumLength = 22;
 constexpr std::size_t kCellIdentityMinimumLength = 38;
@@ -81,14 +81,14 @@ void LTEServingCellInfo::updateWithData(std::span<const std::uint8_t> data, std:
 
 void LTEServingCellInfo::updateFromAntennaInfo(const PacketView& packet) const {
   if (packet.size() < kAntennaInfoMinimumLength) return;
-  SectionRows(*this).set("Num Tx Antennas", lte::decimalText(packet.u8(20)));
+  RowWriter(*this).set("Num Tx Antennas", lte::decimalText(packet.u8(20)));
   // The rest of this record is not decoded, and the trace has always said so.
   logUnknownCode(lte::kAntennaInfoCode);
 }
 
 void LTEServingCellInfo::updateFromCellIdentity(const PacketView& packet) const {
   if (packet.size() < kCellIdentityMinimumLength) return;
-  const SectionRows rows(*this);
+  RowWriter rows(*this);
   rows.set("Physical Cell ID", lte::decimalText(packet.le16(14)));
   rows.set("Download Frequency", lte::decimalText(packet.le16(16)));
   rows.set("Upload Frequency", lte::decimalText(packet.le16(18)));
@@ -111,7 +111,7 @@ void LTEServingCellInfo::updateFromCellList(std::span<const std::uint8_t> data) 
   }
   const Dictionary* serving = findServingCell(*cells);
   if (!serving) return;
-  const SectionRows rows(*this);
+  RowWriter rows(*this);
   // One missing value never hides the others.
   for (const auto& row : kCellListRows) {
     if (const auto value = CellInfoArray::integerValue(*serving, row.cellMonitorKey)) {

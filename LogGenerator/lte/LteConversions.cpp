@@ -6,41 +6,62 @@ namespace corvane::lte {
 
 namespace {
 
-// These texts are built for every row of every packet, so they are written
-// with to_chars instead of a printf pass. to_chars with a precision rounds as
-// printf does; the tests hold both against each other over every field value.
+// These texts are made for every row of every packet, so they are written
+// with integer arithmetic instead of a printf pass. The tests hold them
+// against printf over every value a field can hold.
 
-std::string withUnit(const char* begin, const char* end, std::string_view unit) {
-  std::string text;
-  text.reserve(static_cast<std::size_t>(end - begin) + unit.size());
-  text.append(begin, end);
-  text.append(unit);
-  return text;
-}
+constexpr std::string_view kDbm = " dBm";
+constexpr std::string_view kDb = " dB";
 
-// "%4.2f" followed by the unit. Two decimals make at least four characters
-// ("0.00"), so the field width never pads.
-std::string fixedText(double value, std::string_view unit) {
-  // Wide enough for any double in fixed notation.
-  char digits[320];
-  const auto result = std::to_chars(digits, digits + sizeof digits, value, std::chars_format::fixed, 2);
-  return withUnit(digits, result.ptr, unit);
+// The number's characters and the unit behind them.
+Text withUnit(char* begin, char* end, std::string_view unit) {
+  end += unit.copy(end, unit.size());
+  return Text(std::string_view(begin, static_cast<std::size_t>(end - begin)));
 }
 
 // "%d" followed by the unit.
-std::string integerText(std::int32_t value, std::string_view unit) {
-  char digits[16];
-  const auto result = std::to_chars(digits, digits + sizeof digits, value);
-  return withUnit(digits, result.ptr, unit);
+Text integerText(std::int64_t value, std::string_view unit) {
+  char text[Text::kCapacity];
+  char* end = std::to_chars(text, text + 20, value).ptr;
+  return withUnit(text, end, unit);
 }
+
+// "%4.2f" of eighths / 8, followed by the unit, as printf writes it: to the
+// nearest hundredth, exact ties to the even digit. Every fixed-point LTE field
+// is a whole number of eighths once converted, which a double holds exactly.
+// Two decimals make at least four characters ("0.00"), so the field width of
+// 4 never pads.
+Text eighthsText(std::int64_t eighths, std::string_view unit) {
+  const std::uint64_t magnitude = static_cast<std::uint64_t>(eighths < 0 ? -eighths : eighths);
+  // An eighth is 12.5 hundredths.
+  const std::uint64_t twiceHundredths = magnitude * 25;
+  std::uint64_t hundredths = twiceHundredths / 2;
+  if (twiceHundredths % 2 != 0 && hundredths % 2 != 0) ++hundredths;
+  char text[Text::kCapacity];
+  char* end = text;
+  if (eighths < 0) *end++ = '-';
+  end = std::to_chars(end, text + 20, hundredths / 100).ptr;
+  *end++ = '.';
+  *end++ = static_cast<char>('0' + hundredths / 10 % 10);
+  *end++ = static_cast<char>('0' + hundredths % 10);
+  return withUnit(text, end, unit);
+}
+
+// "%4.2f" of a converted field: every fixed-point conversion gives a whole
+// number of eighths, which the double holds exactly.
+Text fixedText(double value, std::string_view unit) { return eighthsText(static_cast<std::int64_t>(value * 8), unit); }
 
 }  // namespace
 
-std::string decimalText(std::uint32_t value) { return integerText(static_cast<std::int32_t>(value), {}); }
-std::string decimalText(std::int32_t value) { return integerText(value, {}); }
-std::string dbmText(double value) { return fixedText(value, " dBm"); }
-std::string dbText(double value) { return fixedText(value, " dB"); }
-std::string wholeDbmText(std::int32_t value) { return integerText(value, " dBm"); }
-std::string wholeDbText(std::int32_t value) { return integerText(value, " dB"); }
+Text decimalText(std::uint32_t value) { return integerText(static_cast<std::int32_t>(value), {}); }
+Text decimalText(std::int32_t value) { return integerText(value, {}); }
+Text wholeDbmText(std::int32_t value) { return integerText(value, kDbm); }
+Text wholeDbText(std::int32_t value) { return integerText(value, kDb); }
+
+Text rsrpText(std::uint32_t x) { return fixedText(rsrpDbm(x), kDbm); }
+Text rssiText(std::uint32_t x) { return fixedText(rssiDbm(x), kDbm); }
+Text neighborRsrpText(std::uint32_t x) { return fixedText(neighborRsrpDbm(x), kDbm); }
+Text servingRsrqText(std::uint32_t x) { return fixedText(servingRsrqDb(x), kDb); }
+Text rsrqText(std::uint32_t x) { return fixedText(rsrqDb(x), kDb); }
 
 }  // namespace corvane::lte

@@ -8,8 +8,10 @@
 // logs the converted numbers.
 
 #include <array>
+#include <cstddef>
 #include <cstdint>
-#include <string>
+#include <initializer_list>
+#include <optional>
 #include <string_view>
 
 #include "LogGenerator/logcode/Base.h"
@@ -46,27 +48,43 @@ constexpr std::int16_t qrxlevminDbm(std::uint32_t x) {
 
 // --- Texts ---
 
+// A display text, made where it is used: every LTE text is short, so it lives
+// in the object and is copied once, into the display's string.
+class Text {
+ public:
+  static constexpr std::size_t kCapacity = 32;
+  Text() = default;
+  // A constant text; longer ones are cut at kCapacity.
+  explicit Text(std::string_view text) : size_(static_cast<std::uint8_t>(text.copy(chars_.data(), kCapacity))) {}
+  std::string_view view() const { return {chars_.data(), size_}; }
+  operator std::string_view() const { return view(); }
+
+ private:
+  std::array<char, kCapacity> chars_{};
+  std::uint8_t size_ = 0;
+};
+
 inline constexpr std::string_view kNotPresent = "Not Present";
 
 // "%d". A 32-bit field with its top bit set shows negative, as "%d" of the
 // field always has.
-std::string decimalText(std::uint32_t value);
-std::string decimalText(std::int32_t value);
-// "%4.2f dBm" and "%4.2f dB".
-std::string dbmText(double value);
-std::string dbText(double value);
+Text decimalText(std::uint32_t value);
+Text decimalText(std::int32_t value);
 // "%d dBm" and "%d dB".
-std::string wholeDbmText(std::int32_t value);
-std::string wholeDbText(std::int32_t value);
+Text wholeDbmText(std::int32_t value);
+Text wholeDbText(std::int32_t value);
 
-inline std::string rsrpText(std::uint32_t x) { return dbmText(rsrpDbm(x)); }
-inline std::string rssiText(std::uint32_t x) { return dbmText(rssiDbm(x)); }
-inline std::string neighborRsrpText(std::uint32_t x) { return dbmText(neighborRsrpDbm(x)); }
-inline std::string servingRsrqText(std::uint32_t x) { return dbText(servingRsrqDb(x)); }
-inline std::string rsrqText(std::uint32_t x) { return dbText(rsrqDb(x)); }
-inline std::string offset30DbmText(std::uint32_t x) { return wholeDbmText(offset30Dbm(x)); }
-inline std::string qrxlevminText(std::uint32_t x) { return wholeDbmText(qrxlevminDbm(x)); }
-inline std::string trueFalseText(bool value) { return value ? "True" : "False"; }
+// "%4.2f dBm" or "%4.2f dB" of the conversions above, exactly as printf writes
+// the double each gives.
+Text rsrpText(std::uint32_t x);
+Text rssiText(std::uint32_t x);
+Text neighborRsrpText(std::uint32_t x);
+Text servingRsrqText(std::uint32_t x);
+Text rsrqText(std::uint32_t x);
+
+inline Text offset30DbmText(std::uint32_t x) { return wholeDbmText(offset30Dbm(x)); }
+inline Text qrxlevminText(std::uint32_t x) { return wholeDbmText(qrxlevminDbm(x)); }
+inline std::string_view trueFalseText(bool value) { return value ? "True" : "False"; }
 
 // --- Value tables ---
 
@@ -87,22 +105,41 @@ constexpr std::string_view textFor(const std::array<ValueText, N>& table, std::u
 
 // --- Rows ---
 
-// The rows of a dictionary section for the length of one packet: the container
-// is looked up once, and without one (before the first display build) the rows
-// go nowhere.
-class SectionRows {
+// Writes the rows of one dictionary for the length of one packet: a section's
+// container, looked up once (without one, before the first display build, the
+// rows go nowhere), or a list's new row. Rows are written in the order the
+// dictionary holds them, so each is first looked for right behind the one
+// before.
+class RowWriter {
  public:
-  explicit SectionRows(const Base& section) : rows_(section.sectionDictionary()) {}
-  void set(std::string_view key, std::string text) const {
-    if (rows_) rows_->set(key, Value(std::move(text)));
+  explicit RowWriter(const Base& section) : rows_(section.sectionDictionary()) {}
+  explicit RowWriter(Dictionary rows) : rows_(std::move(rows)) {}
+  void set(std::string_view key, std::string_view text) {
+    if (rows_) rows_->setString(key, text, next_);
   }
-  void set(std::string_view key, std::string_view text) const { set(key, std::string(text)); }
   void remove(std::string_view key) const {
     if (rows_) rows_->remove(key);
   }
+  // The dictionary written, for a list's row.
+  Value value() const { return rows_ ? Value(*rows_) : Value(); }
 
  private:
   std::optional<Dictionary> rows_;
+  std::size_t next_ = 0;
+};
+
+// The keys of a list's rows, in the order they are written. A new row is a
+// copy of a prototype that holds them already, so filling it never searches.
+class RowShape {
+ public:
+  RowShape(std::initializer_list<std::string_view> keys) {
+    // Empty strings, which the row's texts are then written into.
+    for (std::string_view key : keys) prototype_.set(key, Value(std::string()));
+  }
+  RowWriter makeRow() const { return RowWriter(prototype_.shallowCopy()); }
+
+ private:
+  Dictionary prototype_;
 };
 
 }  // namespace corvane::lte

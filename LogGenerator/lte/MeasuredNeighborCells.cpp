@@ -9,6 +9,7 @@ namespace corvane {
 namespace {
 constexpr std::size_t kMinimumLength = 29;
 constexpr std::size_t kCountOffset = 27;
+const lte::RowShape kCellRow = {"Physical Cell ID", "Filtered RSRP", "Filtered RSRQ"};
 }  // namespace
 
 BoundedList MeasuredNeighborCells::cells(const PacketView& packet) {
@@ -26,18 +27,18 @@ void MeasuredNeighborCells::updateWithData(std::span<const std::uint8_t> data, s
   const lte::SectionList list(*this);
   const BoundedList measured = cells(packet);
   if (measured.count() == 0) return;
-  Array rows;
+  std::vector<Value> rows;
+  rows.reserve(measured.count());
   for (std::uint8_t i = 0; i < measured.count(); ++i) {
     const std::size_t cell = measured.entryOffset(i);
     if (!lte::entryInside(packet, cell, kCellSize)) break;
-    Dictionary row;
-    row.reserve(3);
+    lte::RowWriter row = kCellRow.makeRow();
     row.set("Physical Cell ID", lte::decimalText(packet.le16(cell)));
     row.set("Filtered RSRP", lte::rsrpText(packet.le16(cell + 2)));
     row.set("Filtered RSRQ", lte::rsrqText(packet.le16(cell + 4)));
-    rows.append(Value(std::move(row)));
+    rows.push_back(row.value());
   }
-  list.install(rows);
+  list.install(Array(std::move(rows)));
 }
 
 }  // namespace corvane

@@ -1,5 +1,7 @@
 #include "LogGenerator/lte/NeighborCellsList.h"
 
+#include <initializer_list>
+
 #include "LogGenerator/lte/LteConversions.h"
 #include "LogGenerator/lte/LteLists.h"
 #include "platform/Log.h"
@@ -10,8 +12,21 @@ namespace {
 
 constexpr std::size_t kMinimumLength = 21;
 
+const lte::RowShape kCellRow = {
+    "Physical Cell ID",   "Measured RSSI",      "Measured RSRP",      "Average RSRP",
+    "Measured RSRQ",      "Average RSRQ",       "Srxlev",             "Frequency Offset",
+    "Ant 0 Frame Offset", "Ant 0 Sample Offset", "Ant 1 Frame Offset", "Ant 1 Sample Offset",
+};
+
 // Every decibel value of a cell is traced under this one label.
 void traceDecibels(double value) { log::printf(log::kWarning, "Measured RSSI: %lf\n", value); }
+
+// Seven traces a cell are worth skipping whole when nobody records them; the
+// logging layer would drop each of them anyway, one at a time.
+void traceCell(std::uint32_t physicalCellId, std::initializer_list<double> decibels) {
+  log::printf(log::kWarning, "Physical Cell ID: %d\n", static_cast<int>(physicalCellId));
+  for (double value : decibels) traceDecibels(value);
+}
 
 }  // namespace
 
@@ -30,7 +45,9 @@ void NeighborCellsList::updateWithData(std::span<const std::uint8_t> data, std::
   const lte::SectionList list(*this);
   const BoundedList neighbors = cells(packet);
   log::printf(log::kWarning, "Number of neighboring cells being reported: %d\n", static_cast<int>(neighbors.count()));
-  Array rows;
+  const bool traced = log::wants(log::kWarning);
+  std::vector<Value> rows;
+  rows.reserve(neighbors.count());
   for (std::uint8_t i = 0; i < neighbors.count(); ++i) {
     const std::size_t cell = neighbors.entryOffset(i);
     if (!lte::entryInside(packet, cell, kCellSize)) break;
@@ -45,16 +62,13 @@ void NeighborCellsList::updateWithData(std::span<const std::uint8_t> data, std::
     const std::uint32_t frameOffset = packet.bits16(cell + 12, 0, 10);
     const std::uint32_t sampleOffset = packet.bits32(cell + 12, 11, 29);
 
-    log::printf(log::kWarning, "Physical Cell ID: %d\n", static_cast<int>(physicalCellId));
-    traceDecibels(lte::rssiDbm(measuredRssi));
-    traceDecibels(lte::neighborRsrpDbm(measuredRsrp));
-    traceDecibels(lte::neighborRsrpDbm(averageRsrp));
-    traceDecibels(lte::servingRsrqDb(measuredRsrq));
-    traceDecibels(lte::servingRsrqDb(averageRsrq));
-    traceDecibels(lte::offset30Dbm(srxlev));
+    if (traced) {
+      traceCell(physicalCellId, {lte::rssiDbm(measuredRssi), lte::neighborRsrpDbm(measuredRsrp),
+                                 lte::neighborRsrpDbm(averageRsrp), lte::servingRsrqDb(measuredRsrq),
+                                 lte::servingRsrqDb(averageRsrq), static_cast<double>(lte::offset30Dbm(srxlev))});
+    }
 
-    Dictionary row;
-    row.reserve(12);
+    lte::RowWriter row = kCellRow.makeRow();
     row.set("Physical Cell ID", lte::decimalText(physicalCellId));
     row.set("Measured RSSI", lte::rssiText(measuredRssi));
     row.set("Measured RSRP", lte::neighborRsrpText(measuredRsrp));
@@ -67,9 +81,9 @@ void NeighborCellsList::updateWithData(std::span<const std::uint8_t> data, std::
     row.set("Ant 0 Sample Offset", lte::decimalText(sampleOffset));
     row.set("Ant 1 Frame Offset", lte::decimalText(frameOffset));
     row.set("Ant 1 Sample Offset", lte::decimalText(sampleOffset));
-    rows.append(Value(std::move(row)));
+    rows.push_back(row.value());
   }
-  list.install(rows);
+  list.install(Array(std::move(rows)));
 }
 
 }  // namespace corvane

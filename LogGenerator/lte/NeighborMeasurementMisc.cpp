@@ -17,7 +17,7 @@ void NeighborMeasurementMisc::updateWithData(std::span<const std::uint8_t> data,
   }
   const PacketView packet(data);
   if (packet.size() < kMinimumLength) return;
-  const lte::SectionRows rows(*this);
+  lte::RowWriter rows(*this);
   rows.set("Version", lte::decimalText(packet.u8(13)));
   rows.set("E-ARFCN", lte::decimalText(packet.le16(17)));
   rows.set("Qrxlevmin", lte::qrxlevminText(packet.bits8(19, 0, 5)));

@@ -14,26 +14,26 @@ using Candidate = ReselectionCandidatesList::Candidate;
 
 constexpr std::size_t kMinimumLength = 21;
 
-void setLteRows(const Candidate& candidate, const Dictionary& row) {
+void setLteRows(const Candidate& candidate, lte::RowWriter& row) {
   const auto fields = candidate.lte();
   row.set("E ARFCN", lte::decimalText(fields.earfcn));
   row.set("Cell ID", lte::decimalText(fields.cellId));
 }
 
-void setUtranRows(const Candidate& candidate, const Dictionary& row) {
+void setUtranRows(const Candidate& candidate, lte::RowWriter& row) {
   const auto fields = candidate.utran();
   row.set("U ARFCN", lte::decimalText(fields.uarfcn));
   row.set("PSC", lte::decimalText(fields.psc));
 }
 
-void setGeranRows(const Candidate& candidate, const Dictionary& row) {
+void setGeranRows(const Candidate& candidate, lte::RowWriter& row) {
   const auto fields = candidate.geran();
   row.set("ARFCN", lte::decimalText(fields.arfcn));
   row.set("Band", lte::decimalText(fields.band));
   row.set("BSIC ID", lte::decimalText(fields.bsicId));
 }
 
-void setCdmaRows(const Candidate& candidate, const Dictionary& row) {
+void setCdmaRows(const Candidate& candidate, lte::RowWriter& row) {
   const auto fields = candidate.cdma();
   row.set("Band", lte::decimalText(fields.band));
   row.set("Channel", lte::decimalText(fields.channel));
@@ -45,7 +45,7 @@ struct CandidateTechnology {
   std::string_view ratType;
   // How far from the candidate's start its fields reach.
   std::size_t extent;
-  void (*setRows)(const Candidate&, const Dictionary&);
+  void (*setRows)(const Candidate&, lte::RowWriter&);
 };
 
 constexpr std::array<CandidateTechnology, 5> kTechnologies = {{
@@ -108,20 +108,20 @@ void ReselectionCandidatesList::updateWithData(std::span<const std::uint8_t> dat
   const lte::SectionList list(*this);
   const Candidates candidates(packet);
   if (candidates.listedCount() == 0) return;
-  Array rows;
+  std::vector<Value> rows;
+  rows.reserve(candidates.listedCount());
   for (std::uint8_t i = 0; i < candidates.listedCount(); ++i) {
     const Candidate candidate = candidates.candidate(i);
     if (!lte::entryInside(packet, candidate.offset(), Candidate::kHeaderSize)) break;
     const CandidateTechnology& technology = technologyOf(candidate);
     if (!lte::entryInside(packet, candidate.offset(), technology.extent)) break;
-    Dictionary row;
-    row.reserve(5);
+    lte::RowWriter row{Dictionary()};
     row.set("Candidate Priority", lte::decimalText(candidate.priority()));
     row.set("Candidate RAT Type", technology.ratType);
     if (technology.setRows) technology.setRows(candidate, row);
-    rows.append(Value(std::move(row)));
+    rows.push_back(row.value());
   }
-  list.install(rows);
+  list.install(Array(std::move(rows)));
 }
 
 }  // namespace corvane

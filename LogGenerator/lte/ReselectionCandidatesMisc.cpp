@@ -17,7 +17,7 @@ void ReselectionCandidatesMisc::updateWithData(std::span<const std::uint8_t> dat
   }
   const PacketView packet(data);
   if (packet.size() < kMinimumLength) return;
-  const lte::SectionRows rows(*this);
+  lte::RowWriter rows(*this);
   rows.set("Version", lte::decimalText(packet.u8(13)));
   rows.set("Serving EARFCN", lte::decimalText(packet.le16(15)));
   rows.set("Serving Cell ID", lte::decimalText(packet.le16(17)));

@@ -14,18 +14,18 @@ constexpr std::size_t kMinimumLength = 33;
 constexpr std::uint32_t kPowerNotPresent = 64;
 constexpr std::uint32_t kSearchNotPresent = 32;
 
-std::string powerText(std::uint32_t field) {
-  return field == kPowerNotPresent ? std::string(lte::kNotPresent) : lte::offset30DbmText(field);
+lte::Text powerText(std::uint32_t field) {
+  return field == kPowerNotPresent ? lte::Text(lte::kNotPresent) : lte::offset30DbmText(field);
 }
 
 // The two search thresholds differ in their unit only: the intra-frequency one
 // has always been shown in dB, the other in dBm.
-std::string intraSearchText(std::uint32_t field) {
-  return field == kSearchNotPresent ? std::string(lte::kNotPresent)
+lte::Text intraSearchText(std::uint32_t field) {
+  return field == kSearchNotPresent ? lte::Text(lte::kNotPresent)
                                     : lte::wholeDbText(2 * static_cast<std::int32_t>(field));
 }
-std::string nonIntraSearchText(std::uint32_t field) {
-  return field == kSearchNotPresent ? std::string(lte::kNotPresent)
+lte::Text nonIntraSearchText(std::uint32_t field) {
+  return field == kSearchNotPresent ? lte::Text(lte::kNotPresent)
                                     : lte::wholeDbmText(2 * static_cast<std::int32_t>(field));
 }
 
@@ -39,7 +39,7 @@ void ServingCellMeasurement::updateWithData(std::span<const std::uint8_t> data, 
   }
   const PacketView packet(data);
   if (packet.size() < kMinimumLength) return;
-  const lte::SectionRows rows(*this);
+  lte::RowWriter rows(*this);
   rows.set("Version", lte::decimalText(packet.u8(13)));
   rows.set("E-ARFCN", lte::decimalText(packet.le16(17)));
   rows.set("Physical Cell ID", lte::decimalText(packet.bits16(19, 0, 8)));

@@ -6,6 +6,7 @@
 #include <gtest/gtest.h>
 
 #include <cstdio>
+#include <string>
 
 namespace corvane {
 namespace {
@@ -27,55 +28,66 @@ std::string printedWholeDbm(int value) {
   return buffer;
 }
 
-TEST(LteConversions, DecibelTextsMatchTheirPrintfFormatsForEveryFieldValue) {
-  for (std::uint32_t x = 0; x < 1024; ++x) {
-    EXPECT_EQ(lte::rsrpText(x), printedDbm(x * 0.25 - 140)) << x;
-    EXPECT_EQ(lte::rssiText(x), printedDbm(x * 0.5 - 140)) << x;
-    EXPECT_EQ(lte::servingRsrqText(x), printedDb(x * 0.25 - 30)) << x;
-    EXPECT_EQ(lte::rsrqText(x), printedDb(x * 0.125 - 20)) << x;
+// Sixteen-bit fields and beyond: the scales' ends, zero crossed from both
+// sides, and the largest field any row reads.
+TEST(LteConversions, DecibelTextsMatchTheirPrintfFormatsForEverySixteenBitField) {
+  for (std::uint32_t x = 0; x <= 0xFFFF; ++x) {
+    ASSERT_EQ(lte::rsrpText(x).view(), printedDbm(x * 0.25 - 140)) << x;
+    ASSERT_EQ(lte::rssiText(x).view(), printedDbm(x * 0.5 - 140)) << x;
+    ASSERT_EQ(lte::neighborRsrpText(x).view(), printedDbm(x * 0.5 - 140)) << x;
+    ASSERT_EQ(lte::servingRsrqText(x).view(), printedDb(x * 0.25 - 30)) << x;
+    ASSERT_EQ(lte::rsrqText(x).view(), printedDb(x * 0.125 - 20)) << x;
   }
-  // Sixteen-bit fields reach far past the scales' ends.
-  for (std::uint32_t x : {4096u, 65535u}) {
-    EXPECT_EQ(lte::rsrpText(x), printedDbm(x * 0.25 - 140)) << x;
-    EXPECT_EQ(lte::rsrqText(x), printedDb(x * 0.125 - 20)) << x;
+  for (std::uint32_t x : {0x10000u, 0x7FFFFFFFu, 0xFFFFFFFFu}) {
+    EXPECT_EQ(lte::rsrpText(x).view(), printedDbm(x * 0.25 - 140)) << x;
+    EXPECT_EQ(lte::rssiText(x).view(), printedDbm(x * 0.5 - 140)) << x;
+    EXPECT_EQ(lte::rsrqText(x).view(), printedDb(x * 0.125 - 20)) << x;
   }
 }
 
 TEST(LteConversions, HalvesOfACentRoundAsPrintfDoes) {
-  EXPECT_EQ(lte::rsrqText(1), "-19.88 dB");
-  EXPECT_EQ(lte::rsrqText(3), "-19.62 dB");
-  EXPECT_EQ(lte::rsrqText(161), "0.12 dB");
-  EXPECT_EQ(lte::dbText(0.0), "0.00 dB");
-  EXPECT_EQ(lte::dbText(-0.0), "-0.00 dB");
+  EXPECT_EQ(lte::rsrqText(1).view(), "-19.88 dB");
+  EXPECT_EQ(lte::rsrqText(3).view(), "-19.62 dB");
+  EXPECT_EQ(lte::rsrqText(159).view(), "-0.12 dB");
+  EXPECT_EQ(lte::rsrqText(160).view(), "0.00 dB");
+  EXPECT_EQ(lte::rsrqText(161).view(), "0.12 dB");
+  EXPECT_EQ(lte::rsrqText(163).view(), "0.38 dB");
 }
 
-TEST(LteConversions, AnyDoubleReadsAsPrintfWouldWriteIt) {
-  for (double v : {1e-300, 0.004, 0.005, 5.0, -1e300, 1.7976931348623157e308}) {
-    EXPECT_EQ(lte::dbmText(v), printedDbm(v)) << v;
-  }
+TEST(LteConversions, NumbersAreTheFormulasInDoublePrecision) {
+  EXPECT_EQ(lte::rsrpDbm(100), -115.0);
+  EXPECT_EQ(lte::rssiDbm(1), -139.5);
+  EXPECT_EQ(lte::neighborRsrpDbm(1), -139.5);
+  EXPECT_EQ(lte::servingRsrqDb(1), -29.75);
+  EXPECT_EQ(lte::rsrqDb(1), -19.875);
 }
 
 TEST(LteConversions, WholeDecibelsAreSigned16BitResults) {
-  EXPECT_EQ(lte::offset30DbmText(0), "-30 dBm");
-  EXPECT_EQ(lte::offset30DbmText(127), "97 dBm");
-  EXPECT_EQ(lte::qrxlevminText(0), "-140 dBm");
-  EXPECT_EQ(lte::qrxlevminText(63), "-14 dBm");
+  EXPECT_EQ(lte::offset30DbmText(0).view(), "-30 dBm");
+  EXPECT_EQ(lte::offset30DbmText(127).view(), "97 dBm");
+  EXPECT_EQ(lte::qrxlevminText(0).view(), "-140 dBm");
+  EXPECT_EQ(lte::qrxlevminText(63).view(), "-14 dBm");
   // Wider fields than any row holds wrap as signed 16-bit numbers would.
   EXPECT_EQ(lte::offset30Dbm(0x10000 + 40), 10);
   EXPECT_EQ(lte::qrxlevminDbm(0x8000), -140);
   for (int x = 0; x < 128; ++x) {
-    EXPECT_EQ(lte::offset30DbmText(static_cast<std::uint32_t>(x)), printedWholeDbm(x - 30));
-    EXPECT_EQ(lte::qrxlevminText(static_cast<std::uint32_t>(x)), printedWholeDbm(2 * x - 140));
+    EXPECT_EQ(lte::offset30DbmText(static_cast<std::uint32_t>(x)).view(), printedWholeDbm(x - 30));
+    EXPECT_EQ(lte::qrxlevminText(static_cast<std::uint32_t>(x)).view(), printedWholeDbm(2 * x - 140));
   }
 }
 
 TEST(LteConversions, DecimalsAreSigned32Bit) {
-  EXPECT_EQ(lte::decimalText(std::uint32_t{0}), "0");
-  EXPECT_EQ(lte::decimalText(std::uint32_t{65535}), "65535");
-  EXPECT_EQ(lte::decimalText(std::uint32_t{0xFFFFFFFF}), "-1");
-  EXPECT_EQ(lte::decimalText(std::int32_t{-2147483647 - 1}), "-2147483648");
-  EXPECT_EQ(lte::wholeDbText(10), "10 dB");
-  EXPECT_EQ(lte::wholeDbmText(10), "10 dBm");
+  EXPECT_EQ(lte::decimalText(std::uint32_t{0}).view(), "0");
+  EXPECT_EQ(lte::decimalText(std::uint32_t{65535}).view(), "65535");
+  EXPECT_EQ(lte::decimalText(std::uint32_t{0xFFFFFFFF}).view(), "-1");
+  EXPECT_EQ(lte::decimalText(std::int32_t{-2147483647 - 1}).view(), "-2147483648");
+  EXPECT_EQ(lte::wholeDbText(10).view(), "10 dB");
+  EXPECT_EQ(lte::wholeDbmText(-2147483647 - 1).view(), "-2147483648 dBm");
+}
+
+TEST(LteConversions, AConstantTextIsKeptWhole) {
+  EXPECT_EQ(lte::Text(lte::kNotPresent).view(), "Not Present");
+  EXPECT_EQ(lte::Text().view(), "");
 }
 
 TEST(LteConversions, AValueTableFallsBackForValuesItDoesNotHold) {
