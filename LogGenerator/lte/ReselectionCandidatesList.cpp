@@ -46,17 +46,25 @@ struct CandidateTechnology {
   // How far from the candidate's start its fields reach.
   std::size_t extent;
   void (*setRows)(const Candidate&, lte::RowWriter&);
+  // Every row of such a candidate, in the order written.
+  lte::RowShape shape;
 };
 
-constexpr std::array<CandidateTechnology, 5> kTechnologies = {{
-    {Candidate::kLte, "LTE", 8, setLteRows},
-    {Candidate::kUtran, "UTRAN", 8, setUtranRows},
-    {Candidate::kGeran, "GERAN", 8, setGeranRows},
-    {Candidate::kCdma1xRtt, "CDMA1XRTT", 12, setCdmaRows},
-    {Candidate::kCdmaHrpd, "CDMAHRPD", 12, setCdmaRows},
+const std::array<CandidateTechnology, 5> kTechnologies = {{
+    {Candidate::kLte, "LTE", 8, setLteRows,
+     {"Candidate Priority", "Candidate RAT Type", "E ARFCN", "Cell ID"}},
+    {Candidate::kUtran, "UTRAN", 8, setUtranRows,
+     {"Candidate Priority", "Candidate RAT Type", "U ARFCN", "PSC"}},
+    {Candidate::kGeran, "GERAN", 8, setGeranRows,
+     {"Candidate Priority", "Candidate RAT Type", "ARFCN", "Band", "BSIC ID"}},
+    {Candidate::kCdma1xRtt, "CDMA1XRTT", 12, setCdmaRows,
+     {"Candidate Priority", "Candidate RAT Type", "Band", "Channel", "Pilot"}},
+    {Candidate::kCdmaHrpd, "CDMAHRPD", 12, setCdmaRows,
+     {"Candidate Priority", "Candidate RAT Type", "Band", "Channel", "Pilot"}},
 }};
 // A technology the list does not know shows this and no further rows.
-constexpr CandidateTechnology kUnknownTechnology = {0, "??", Candidate::kHeaderSize, nullptr};
+const CandidateTechnology kUnknownTechnology = {0, "??", Candidate::kHeaderSize, nullptr,
+                                                {"Candidate Priority", "Candidate RAT Type"}};
 
 const CandidateTechnology& technologyOf(const Candidate& candidate) {
   for (const auto& technology : kTechnologies) {
@@ -115,7 +123,7 @@ void ReselectionCandidatesList::updateWithData(std::span<const std::uint8_t> dat
     if (!lte::entryInside(packet, candidate.offset(), Candidate::kHeaderSize)) break;
     const CandidateTechnology& technology = technologyOf(candidate);
     if (!lte::entryInside(packet, candidate.offset(), technology.extent)) break;
-    lte::RowWriter row{Dictionary()};
+    lte::RowWriter row = technology.shape.makeRow();
     row.set("Candidate Priority", lte::decimalText(candidate.priority()));
     row.set("Candidate RAT Type", technology.ratType);
     if (technology.setRows) technology.setRows(candidate, row);
