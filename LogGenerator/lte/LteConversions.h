@@ -40,7 +40,9 @@ constexpr double servingRsrqDb(std::uint32_t x) { return x * 0.25 - 30.0; }
 constexpr double rsrqDb(std::uint32_t x) { return x * 0.125 - 20.0; }
 // Srxlev, P_Max and Max UE Tx Power. Kept as a signed 16-bit result, which is
 // what the display has always shown.
-constexpr std::int16_t offset30Dbm(std::uint32_t x) { return static_cast<std::int16_t>(static_cast<std::int32_t>(x) - 30); }
+constexpr std::int16_t offset30Dbm(std::uint32_t x) {
+  return static_cast<std::int16_t>(static_cast<std::int32_t>(x) - 30);
+}
 // Qrxlevmin, 2 dB steps from -140 dBm; signed 16-bit like offset30Dbm.
 constexpr std::int16_t qrxlevminDbm(std::uint32_t x) {
   return static_cast<std::int16_t>(2 * static_cast<std::int32_t>(x) - 140);

@@ -37,8 +37,9 @@ Bytes carrierPacket(std::size_t size = 38) {
 }
 
 Value lteCell(const char* type, std::initializer_list<std::pair<std::string, Value>> numbers) {
-  Dictionary cell = test::Dict({{std::string(CellMonitorCellRadioAccessTechnology), S(std::string(CellMonitorRadioAccessTechnologyLTE))},
-                                {std::string(CellMonitorCellType), S(type)}});
+  Dictionary cell;
+  cell.set(CellMonitorCellRadioAccessTechnology, S(std::string(CellMonitorRadioAccessTechnologyLTE)));
+  cell.set(CellMonitorCellType, S(type));
   for (const auto& [k, v] : numbers) cell.set(k, v);
   return Value(cell);
 }

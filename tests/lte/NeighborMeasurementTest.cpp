@@ -55,7 +55,8 @@ TEST_F(NeighborMisc, WritesVersionCarrierAndQrxlevmin) {
   const Dictionary rows = attachRows();
   log::ScopedCapture capture;
   feed(neighborPacket({Cell{}}), 0xB180);
-  EXPECT_EQ(Value(rows), test::D({{"Version", test::S("2")}, {"E-ARFCN", test::S("1850")}, {"Qrxlevmin", test::S("-94 dBm")}}));
+  EXPECT_EQ(Value(rows),
+            test::D({{"Version", test::S("2")}, {"E-ARFCN", test::S("1850")}, {"Qrxlevmin", test::S("-94 dBm")}}));
   EXPECT_EQ(capture.lines(), test::warnings({"Neighbor Measurements"}));
 }
 

@@ -91,7 +91,8 @@ TEST(Log, LinesLongerThanTheUsualAreFormattedWhole) {
   log::printf(log::kError, "%s|%d", longText.c_str(), 42);
   log::printf(log::kError, "%s", std::string(255, 'y').c_str());
   log::printf(log::kError, "%s", std::string(256, 'z').c_str());
-  EXPECT_EQ(capture.texts(), (std::vector<std::string>{longText + "|42", std::string(255, 'y'), std::string(256, 'z')}));
+  EXPECT_EQ(capture.texts(),
+            (std::vector<std::string>{longText + "|42", std::string(255, 'y'), std::string(256, 'z')}));
 }
 
 TEST(Log, PointersShowAsHexWithNullAsZero) {

@@ -140,7 +140,8 @@ TEST(Value, SetStringWritesIntoTheStringThereOrReplacesAnythingElse) {
   d.setString("number", "4 dBm", next);
   d.setString("new", "x", next);
   EXPECT_EQ(next, 3u);
-  EXPECT_EQ(Value(shared), D({{"text", S("a longer text than fits in place")}, {"number", S("4 dBm")}, {"new", S("x")}}));
+  EXPECT_EQ(Value(shared),
+            D({{"text", S("a longer text than fits in place")}, {"number", S("4 dBm")}, {"new", S("x")}}));
 }
 
 TEST(Value, EqualityIsStructural) {
