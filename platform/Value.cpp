@@ -122,7 +122,15 @@ void Dictionary::setString(std::string_view key, std::string_view text, std::siz
     storage_->append(key, Value(text));
     next = storage_->entries.size();
   } else if (auto* string = std::get_if<std::string>(&existing->v_)) {
-    string->assign(text);
+    // A text of the same length, as a value rewritten on every update mostly
+    // is, and a first text into an empty string take the short ways.
+    if (string->size() == text.size()) {
+      text.copy(string->data(), text.size());
+    } else if (string->empty()) {
+      string->append(text);
+    } else {
+      string->assign(text);
+    }
   } else {
     *existing = Value(text);
   }

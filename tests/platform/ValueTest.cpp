@@ -142,6 +142,17 @@ TEST(Value, SetStringWritesIntoTheStringThereOrReplacesAnythingElse) {
   EXPECT_EQ(next, 3u);
   EXPECT_EQ(Value(shared),
             D({{"text", S("a longer text than fits in place")}, {"number", S("4 dBm")}, {"new", S("x")}}));
+  // Same length, into an empty string, and shorter.
+  d.set("empty", S(""));
+  next = 0;
+  d.setString("text", "A LONGER TEXT THAN FITS IN PLACE", next);
+  d.setString("number", "5", next);
+  d.setString("new", "y", next);
+  d.setString("empty", "now full", next);
+  EXPECT_EQ(Value(shared), D({{"text", S("A LONGER TEXT THAN FITS IN PLACE")},
+                              {"number", S("5")},
+                              {"new", S("y")},
+                              {"empty", S("now full")}}));
 }
 
 TEST(Value, EqualityIsStructural) {
