@@ -13,17 +13,15 @@ namespace {
 constexpr std::string_view kDbm = " dBm";
 constexpr std::string_view kDb = " dB";
 
-// The number's characters and the unit behind them.
-Text withUnit(char* begin, char* end, std::string_view unit) {
-  end += unit.copy(end, unit.size());
-  return Text(std::string_view(begin, static_cast<std::size_t>(end - begin)));
-}
+// Puts the unit behind the number's characters and ends the text there.
+void endWithUnit(Text& text, char* end, std::string_view unit) { text.setEnd(end + unit.copy(end, unit.size())); }
 
 // "%d" followed by the unit.
 Text integerText(std::int64_t value, std::string_view unit) {
-  char text[Text::kCapacity];
-  char* end = std::to_chars(text, text + 20, value).ptr;
-  return withUnit(text, end, unit);
+  Text text;
+  char* end = std::to_chars(text.begin(), text.begin() + 20, value).ptr;
+  endWithUnit(text, end, unit);
+  return text;
 }
 
 // "%4.2f" of eighths / 8, followed by the unit, as printf writes it: to the
@@ -37,14 +35,15 @@ Text eighthsText(std::int64_t eighths, std::string_view unit) {
   const std::uint64_t twiceHundredths = magnitude * 25;
   std::uint64_t hundredths = twiceHundredths / 2;
   if (twiceHundredths % 2 != 0 && hundredths % 2 != 0) ++hundredths;
-  char text[Text::kCapacity];
-  char* end = text;
+  Text text;
+  char* end = text.begin();
   if (eighths < 0) *end++ = '-';
-  end = std::to_chars(end, text + 20, hundredths / 100).ptr;
+  end = std::to_chars(end, text.begin() + 20, hundredths / 100).ptr;
   *end++ = '.';
   *end++ = static_cast<char>('0' + hundredths / 10 % 10);
   *end++ = static_cast<char>('0' + hundredths % 10);
-  return withUnit(text, end, unit);
+  endWithUnit(text, end, unit);
+  return text;
 }
 
 // "%4.2f" of a converted field: every fixed-point conversion gives a whole

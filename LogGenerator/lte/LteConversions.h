@@ -61,6 +61,10 @@ class Text {
   std::string_view view() const { return {chars_.data(), size_}; }
   operator std::string_view() const { return view(); }
 
+  // For the text makers: the characters are written in place, then counted.
+  char* begin() { return chars_.data(); }
+  void setEnd(const char* end) { size_ = static_cast<std::uint8_t>(end - chars_.data()); }
+
  private:
   std::array<char, kCapacity> chars_{};
   std::uint8_t size_ = 0;
