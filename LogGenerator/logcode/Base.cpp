@@ -124,4 +124,15 @@ void Base::logUnknownCode(std::uint32_t logCode) {
   log::printf(log::kError, "Received an unknown log message: %d", static_cast<std::int32_t>(logCode));
 }
 
+std::optional<PacketView> Base::acceptPacket(std::string_view trace, std::span<const std::uint8_t> data,
+                                             std::uint32_t logCode, std::uint32_t ownCode, std::size_t minimumLength) {
+  log::write(log::kWarning, trace);
+  if (logCode != ownCode) {
+    logUnknownCode(logCode);
+    return std::nullopt;
+  }
+  if (data.size() < minimumLength) return std::nullopt;
+  return PacketView(data);
+}
+
 }  // namespace corvane

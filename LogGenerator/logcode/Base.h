@@ -14,6 +14,7 @@
 #include <optional>
 #include <span>
 #include <string>
+#include <string_view>
 #include <unordered_map>
 #include <utility>
 #include <variant>
@@ -127,6 +128,13 @@ class Base : public std::enable_shared_from_this<Base> {
   void removeRow(std::string_view key) const;
   // "Received an unknown log message: %d" at level 3, the code as signed decimal.
   static void logUnknownCode(std::uint32_t logCode);
+  // The entry of a section with one code: traces the section at level 4, logs a
+  // foreign code, and gives the packet when the code is the section's own and
+  // the packet holds at least minimumLength bytes (a shorter one is dropped
+  // without a message).
+  static std::optional<PacketView> acceptPacket(std::string_view trace, std::span<const std::uint8_t> data,
+                                                std::uint32_t logCode, std::uint32_t ownCode,
+                                                std::size_t minimumLength);
 
  private:
   std::variant<std::monostate, Dictionary::Weak, Array::Weak> sectionRef;

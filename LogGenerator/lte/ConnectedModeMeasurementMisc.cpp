@@ -10,13 +10,11 @@ constexpr std::size_t kMinimumLength = 29;
 }  // namespace
 
 void ConnectedModeMeasurementMisc::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
-  log::write(log::kWarning, "Connected mode LTE Intra-frequency Measurement");
-  if (logCode != lte::kConnectedIntraFrequencyCode) {
-    logUnknownCode(logCode);
-    return;
-  }
-  const PacketView packet(data);
-  if (packet.size() < kMinimumLength) return;
+  const auto accepted =
+      acceptPacket("Connected mode LTE Intra-frequency Measurement", data, logCode,
+                   lte::kConnectedIntraFrequencyCode, kMinimumLength);
+  if (!accepted) return;
+  const PacketView& packet = *accepted;
   lte::RowWriter rows(*this);
   rows.set("E-ARFCN", lte::decimalText(packet.le16(17)));
   rows.set("Serving Physical Cell ID", lte::decimalText(packet.le16(19)));

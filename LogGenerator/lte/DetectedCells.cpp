@@ -22,26 +22,18 @@ BoundedList DetectedCells::cells(const PacketView& packet) {
 }
 
 void DetectedCells::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
-  log::write(log::kWarning, "Detected Cells");
-  if (logCode != lte::kConnectedIntraFrequencyCode) {
-    logUnknownCode(logCode);
-    return;
-  }
-  const PacketView packet(data);
-  if (packet.size() < kMinimumLength) return;
+  const auto accepted =
+      acceptPacket("Detected Cells", data, logCode, lte::kConnectedIntraFrequencyCode, kMinimumLength);
+  if (!accepted) return;
+  const PacketView& packet = *accepted;
   const lte::SectionList list(*this);
   const BoundedList detected = cells(packet);
   if (detected.count() == 0) return;
-  std::vector<Value> rows;
-  rows.reserve(detected.count());
-  for (std::uint8_t i = 0; i < detected.count(); ++i) {
-    const std::size_t cell = detected.entryOffset(i);
-    if (!lte::entryInside(packet, cell, kCellSize)) break;
+  list.install(lte::rowsOfEntries(packet, detected, kCellSize, [&](std::size_t cell) {
     lte::RowWriter row = kCellRow.makeRow();
     row.set("Physical Cell ID", lte::decimalText(packet.le16(cell)));
-    rows.push_back(row.value());
-  }
-  list.install(Array(std::move(rows)));
+    return row.value();
+  }));
 }
 
 }  // namespace corvane

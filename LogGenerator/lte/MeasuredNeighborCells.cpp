@@ -17,28 +17,20 @@ BoundedList MeasuredNeighborCells::cells(const PacketView& packet) {
 }
 
 void MeasuredNeighborCells::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
-  log::write(log::kWarning, "Measured Neighbor Cells");
-  if (logCode != lte::kConnectedIntraFrequencyCode) {
-    logUnknownCode(logCode);
-    return;
-  }
-  const PacketView packet(data);
-  if (packet.size() < kMinimumLength) return;
+  const auto accepted =
+      acceptPacket("Measured Neighbor Cells", data, logCode, lte::kConnectedIntraFrequencyCode, kMinimumLength);
+  if (!accepted) return;
+  const PacketView& packet = *accepted;
   const lte::SectionList list(*this);
   const BoundedList measured = cells(packet);
   if (measured.count() == 0) return;
-  std::vector<Value> rows;
-  rows.reserve(measured.count());
-  for (std::uint8_t i = 0; i < measured.count(); ++i) {
-    const std::size_t cell = measured.entryOffset(i);
-    if (!lte::entryInside(packet, cell, kCellSize)) break;
+  list.install(lte::rowsOfEntries(packet, measured, kCellSize, [&](std::size_t cell) {
     lte::RowWriter row = kCellRow.makeRow();
     row.set("Physical Cell ID", lte::decimalText(packet.le16(cell)));
     row.set("Filtered RSRP", lte::rsrpText(packet.le16(cell + 2)));
     row.set("Filtered RSRQ", lte::rsrqText(packet.le16(cell + 4)));
-    rows.push_back(row.value());
-  }
-  list.install(Array(std::move(rows)));
+    return row.value();
+  }));
 }
 
 }  // namespace corvane

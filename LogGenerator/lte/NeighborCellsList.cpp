@@ -35,22 +35,15 @@ BoundedList NeighborCellsList::cells(const PacketView& packet) {
 }
 
 void NeighborCellsList::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
-  log::write(log::kWarning, "Neighbor Cells List");
-  if (logCode != lte::kNeighborMeasurementCode) {
-    logUnknownCode(logCode);
-    return;
-  }
-  const PacketView packet(data);
-  if (packet.size() < kMinimumLength) return;
+  const auto accepted =
+      acceptPacket("Neighbor Cells List", data, logCode, lte::kNeighborMeasurementCode, kMinimumLength);
+  if (!accepted) return;
+  const PacketView& packet = *accepted;
   const lte::SectionList list(*this);
   const BoundedList neighbors = cells(packet);
   log::printf(log::kWarning, "Number of neighboring cells being reported: %d\n", static_cast<int>(neighbors.count()));
   const bool traced = log::wants(log::kWarning);
-  std::vector<Value> rows;
-  rows.reserve(neighbors.count());
-  for (std::uint8_t i = 0; i < neighbors.count(); ++i) {
-    const std::size_t cell = neighbors.entryOffset(i);
-    if (!lte::entryInside(packet, cell, kCellSize)) break;
+  list.install(lte::rowsOfEntries(packet, neighbors, kCellSize, [&](std::size_t cell) {
     const std::uint32_t physicalCellId = packet.bits16(cell, 0, 8);
     const std::uint32_t measuredRssi = packet.bits32(cell, 9, 16);
     const std::uint32_t measuredRsrp = packet.bits32(cell, 17, 25);
@@ -81,9 +74,8 @@ void NeighborCellsList::updateWithData(std::span<const std::uint8_t> data, std::
     row.set("Ant 0 Sample Offset", lte::decimalText(sampleOffset));
     row.set("Ant 1 Frame Offset", lte::decimalText(frameOffset));
     row.set("Ant 1 Sample Offset", lte::decimalText(sampleOffset));
-    rows.push_back(row.value());
-  }
-  list.install(Array(std::move(rows)));
+    return row.value();
+  }));
 }
 
 }  // namespace corvane

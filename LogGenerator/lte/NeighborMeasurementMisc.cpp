@@ -10,13 +10,10 @@ constexpr std::size_t kMinimumLength = 21;
 }  // namespace
 
 void NeighborMeasurementMisc::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
-  log::write(log::kWarning, "Neighbor Measurements");
-  if (logCode != lte::kNeighborMeasurementCode) {
-    logUnknownCode(logCode);
-    return;
-  }
-  const PacketView packet(data);
-  if (packet.size() < kMinimumLength) return;
+  const auto accepted =
+      acceptPacket("Neighbor Measurements", data, logCode, lte::kNeighborMeasurementCode, kMinimumLength);
+  if (!accepted) return;
+  const PacketView& packet = *accepted;
   lte::RowWriter rows(*this);
   rows.set("Version", lte::decimalText(packet.u8(13)));
   rows.set("E-ARFCN", lte::decimalText(packet.le16(17)));

@@ -106,13 +106,10 @@ ReselectionCandidatesList::CdmaFields Candidate::cdma() const {
 // --- The section ---
 
 void ReselectionCandidatesList::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
-  log::write(log::kWarning, "Reselection Candidates List");
-  if (logCode != lte::kReselectionCandidatesCode) {
-    logUnknownCode(logCode);
-    return;
-  }
-  const PacketView packet(data);
-  if (packet.size() < kMinimumLength) return;
+  const auto accepted =
+      acceptPacket("Reselection Candidates List", data, logCode, lte::kReselectionCandidatesCode, kMinimumLength);
+  if (!accepted) return;
+  const PacketView& packet = *accepted;
   const lte::SectionList list(*this);
   const Candidates candidates(packet);
   if (candidates.listedCount() == 0) return;

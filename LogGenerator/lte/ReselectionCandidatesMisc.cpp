@@ -10,13 +10,10 @@ constexpr std::size_t kMinimumLength = 21;
 }  // namespace
 
 void ReselectionCandidatesMisc::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
-  log::write(log::kWarning, "Reselection Candidates");
-  if (logCode != lte::kReselectionCandidatesCode) {
-    logUnknownCode(logCode);
-    return;
-  }
-  const PacketView packet(data);
-  if (packet.size() < kMinimumLength) return;
+  const auto accepted =
+      acceptPacket("Reselection Candidates", data, logCode, lte::kReselectionCandidatesCode, kMinimumLength);
+  if (!accepted) return;
+  const PacketView& packet = *accepted;
   lte::RowWriter rows(*this);
   rows.set("Version", lte::decimalText(packet.u8(13)));
   rows.set("Serving EARFCN", lte::decimalText(packet.le16(15)));

@@ -32,13 +32,10 @@ lte::Text nonIntraSearchText(std::uint32_t field) {
 }  // namespace
 
 void ServingCellMeasurement::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
-  log::write(log::kWarning, "Serving Cell Measurements");
-  if (logCode != lte::kServingCellMeasurementCode) {
-    logUnknownCode(logCode);
-    return;
-  }
-  const PacketView packet(data);
-  if (packet.size() < kMinimumLength) return;
+  const auto accepted =
+      acceptPacket("Serving Cell Measurements", data, logCode, lte::kServingCellMeasurementCode, kMinimumLength);
+  if (!accepted) return;
+  const PacketView& packet = *accepted;
   lte::RowWriter rows(*this);
   rows.set("Version", lte::decimalText(packet.u8(13)));
   rows.set("E-ARFCN", lte::decimalText(packet.le16(17)));

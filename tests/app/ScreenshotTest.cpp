@@ -24,6 +24,46 @@ const std::string kService = CORVANE_TELEPHONYD_BINARY;
 constexpr int kWindowWidth = 400;
 constexpr int kWindowHeight = 720;
 
+// The real service in a private runtime directory, with a device root that
+// allows saving; stopped again when the object dies.
+class LiveService {
+ public:
+  explicit LiveService(const std::vector<std::string>& options) {
+    std::filesystem::create_directories(devicePath(kSaveEnablingMarkerPath, root));
+    std::filesystem::create_directories(devicePath(kSnapshotDirectoryPath, root));
+    ::setenv("CORVANE_RUNTIME_DIR", runtime.c_str(), 1);
+    platform = SocketModelEnvironment::create(error);
+    std::vector<std::string> argv{kService};
+    argv.insert(argv.end(), options.begin(), options.end());
+    pid_ = test::startProcess(argv, {"CORVANE_RUNTIME_DIR=" + runtime}, directory.path() + "/service.log");
+  }
+  ~LiveService() {
+    if (pid_ > 0) test::stopProcess(pid_, SIGTERM);
+    ::unsetenv("CORVANE_RUNTIME_DIR");
+  }
+  LiveService(const LiveService&) = delete;
+  LiveService& operator=(const LiveService&) = delete;
+
+  bool listening() const { return std::filesystem::exists(runtime + "/corvane-telephonyd.sock"); }
+  QString configDirectory() const { return QString::fromStdString(directory.path() + "/config"); }
+
+  test::TemporaryDirectory directory;
+  const std::string runtime = directory.path() + "/run";
+  const std::filesystem::path root = directory.path() + "/device";
+  std::string error;
+  std::unique_ptr<SocketModelEnvironment> platform;
+
+ private:
+  int pid_ = -1;
+};
+
+// Launches the application in a window of the screenshots' size; true once it is shown.
+bool launch(CorvaneApp& app) {
+  app.applicationDidFinishLaunching();
+  app.window()->resize(kWindowWidth, kWindowHeight);
+  return QTest::qWaitForWindowExposed(app.window());
+}
+
 }  // namespace
 
 class ScreenshotTest : public QObject {
@@ -52,27 +92,16 @@ class ScreenshotTest : public QObject {
 
  private slots:
   void theApplicationShowsTheServicesTreeOpensASectionAndSavesASnapshot() {
-    test::TemporaryDirectory directory;
-    const std::string runtime = directory.path() + "/run";
-    const std::filesystem::path root = directory.path() + "/device";
-    std::filesystem::create_directories(devicePath(kSaveEnablingMarkerPath, root));
-    std::filesystem::create_directories(devicePath(kSnapshotDirectoryPath, root));
-    ::setenv("CORVANE_RUNTIME_DIR", runtime.c_str(), 1);
+    LiveService service({"--technology", "IFX", "--seed", "7", "--rate", "50"});
+    QVERIFY2(service.platform, service.error.c_str());
+    QTRY_VERIFY_WITH_TIMEOUT(service.listening(), 10000);
+    const std::filesystem::path& root = service.root;
 
-    std::string error;
-    std::unique_ptr<SocketModelEnvironment> platform = SocketModelEnvironment::create(error);
-    QVERIFY2(platform, error.c_str());
-    const int service = test::startProcess({kService, "--technology", "IFX", "--seed", "7", "--rate", "50"},
-                                           {"CORVANE_RUNTIME_DIR=" + runtime}, directory.path() + "/service.log");
-    QTRY_VERIFY_WITH_TIMEOUT(std::filesystem::exists(runtime + "/corvane-telephonyd.sock"), 10000);
-
-    Preferences preferences(QString::fromStdString(directory.path() + "/config"));
+    Preferences preferences(service.configDirectory());
     {
-      CorvaneApp app(CorvaneAppEnvironment{platform->environment(), preferences, root});
-      app.applicationDidFinishLaunching();
+      CorvaneApp app(CorvaneAppEnvironment{service.platform->environment(), preferences, root});
+      QVERIFY(launch(app));
       QWidget* window = app.window();
-      window->resize(kWindowWidth, kWindowHeight);
-      QVERIFY(QTest::qWaitForWindowExposed(window));
       NavigationController* navigation = app.navigationController();
       auto top = [&] { return qobject_cast<CorvanePaneController*>(navigation->topViewController()); };
 
@@ -120,32 +149,20 @@ class ScreenshotTest : public QObject {
       QVERIFY(snapshot.asDictionary() && snapshot.asDictionary()->get("Data").isArray());
       QCOMPARE(*snapshot.asDictionary()->find("Description")->asString(), std::string("Drive test, north ring road"));
     }
-    test::stopProcess(service, SIGTERM);
-    ::unsetenv("CORVANE_RUNTIME_DIR");
   }
 
   // Every LTE screen shows decoded values (no template placeholder left) and
   // they change from one display update to a later one.
   void theLteScenarioShowsLiveChangingValuesOnEveryLteScreen() {
-    test::TemporaryDirectory directory;
-    const std::string runtime = directory.path() + "/run";
-    const std::filesystem::path root = directory.path() + "/device";
-    ::setenv("CORVANE_RUNTIME_DIR", runtime.c_str(), 1);
+    LiveService service({"--technology", "Quendra_LTE", "--seed", "3", "--rate", "10"});
+    QVERIFY2(service.platform, service.error.c_str());
+    QTRY_VERIFY_WITH_TIMEOUT(service.listening(), 10000);
 
-    std::string error;
-    std::unique_ptr<SocketModelEnvironment> platform = SocketModelEnvironment::create(error);
-    QVERIFY2(platform, error.c_str());
-    const int service = test::startProcess({kService, "--technology", "Quendra_LTE", "--seed", "3", "--rate", "10"},
-                                           {"CORVANE_RUNTIME_DIR=" + runtime}, directory.path() + "/service.log");
-    QTRY_VERIFY_WITH_TIMEOUT(std::filesystem::exists(runtime + "/corvane-telephonyd.sock"), 10000);
-
-    Preferences preferences(QString::fromStdString(directory.path() + "/config"));
+    Preferences preferences(service.configDirectory());
     {
-      CorvaneApp app(CorvaneAppEnvironment{platform->environment(), preferences, root});
-      app.applicationDidFinishLaunching();
+      CorvaneApp app(CorvaneAppEnvironment{service.platform->environment(), preferences, service.root});
+      QVERIFY(launch(app));
       QWidget* window = app.window();
-      window->resize(kWindowWidth, kWindowHeight);
-      QVERIFY(QTest::qWaitForWindowExposed(window));
       NavigationController* navigation = app.navigationController();
       auto top = [&] { return qobject_cast<CorvanePaneController*>(navigation->topViewController()); };
       QTRY_VERIFY_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 4, 20000);
@@ -232,8 +249,6 @@ class ScreenshotTest : public QObject {
         QVERIFY2(changed, qPrintable(screen.section + QStringLiteral(": ") + before.join(QStringLiteral(", "))));
       }
     }
-    test::stopProcess(service, SIGTERM);
-    ::unsetenv("CORVANE_RUNTIME_DIR");
   }
 };
 
