@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
+
 #include "PacketInput.h"
 #include "support/LogRecords.h"
 #include "support/Values.h"
@@ -91,8 +93,9 @@ TEST(DlfReader, OnATieTheRecordWithoutATypeByteWins) {
   // type 0x01 and a record of 257 bytes one byte late, which takes the next
   // packet's type byte, after which that packet reads without it: as many
   // records, as many without a type byte.
-  Bytes payload = test::bytesOf("bplist00");
-  payload.resize(257 - 12, 0x11);
+  Bytes payload(257 - 12, 0x11);
+  const Bytes magic = test::bytesOf("bplist00");
+  std::copy(magic.begin(), magic.end(), payload.begin());
   const Bytes cellList = withType(0xFF, logRecord(0x0001, 1, payload));
   const Bytes next = withType(0x01, logRecord(0xB0C2, 2, {1, 2, 3}));
   EXPECT_EQ(read(dlfOfIntervals({{cellList, next}})).packets, (std::vector<Bytes>{cellList, next}));
