@@ -3,7 +3,9 @@
 #include <array>
 
 #include "LogGenerator/GSM/GSMLogGenerator.h"
-#include "LogGenerator/logcode/TechnologyGenerators.h"
+#include "LogGenerator/gsm_umts/QND_GSMLogGenerator.h"
+#include "LogGenerator/lte/LTELogGenerator.h"
+#include "LogGenerator/utran/UTRANLogGenerator.h"
 #include "platform/DateText.h"
 #include "platform/Log.h"
 #include "platform/LogChannelTechnology.h"

@@ -21,7 +21,9 @@
 #include <memory>
 #include <vector>
 
-#include "LogGenerator/logcode/TechnologyGenerators.h"
+#include "LogGenerator/gsm_umts/QND_GSMLogGenerator.h"
+#include "LogGenerator/lte/LTELogGenerator.h"
+#include "LogGenerator/utran/UTRANLogGenerator.h"
 #include "platform/Log.h"
 
 namespace {

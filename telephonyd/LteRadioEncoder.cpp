@@ -9,6 +9,11 @@
 #include <stdexcept>
 #include <string>
 
+#include "LogGenerator/lte/records/IntraFrequencyMeasurementRecord.h"
+#include "LogGenerator/lte/records/NeighborMeasurementRecord.h"
+#include "LogGenerator/lte/records/ReselectionCandidatesRecord.h"
+#include "LogGenerator/lte/records/ServingCellIdentityRecord.h"
+#include "LogGenerator/lte/records/ServingCellMeasurementRecord.h"
 #include "telephonyd/RecordWriter.h"
 
 namespace corvane::telephonyd {
@@ -19,149 +24,10 @@ using namespace std::chrono_literals;
 using Access = SimulatedNetwork::Access;
 using Cell = SimulatedNetwork::Cell;
 
-// --- Record layouts: offsets from the packet's type byte ---
+// The record layouts are the decoders' own (LogGenerator/lte/records/);
+// values in dBm and dB go in through the fields' conversions.
 
 constexpr std::uint32_t kRecordVersion = 1;
-
-// 0xB0C2, serving cell identity and carrier.
-namespace cell_identity {
-constexpr std::uint16_t kCode = 0xB0C2;
-constexpr std::size_t kSize = 38;
-constexpr RecordField kVersion{13, 1};
-constexpr RecordField kPhysicalCellId{14, 2};
-constexpr RecordField kDownlinkEarfcn{16, 2};
-constexpr RecordField kUplinkEarfcn{18, 2};
-constexpr RecordField kDownlinkBandwidth{20, 1};  // resource blocks
-constexpr RecordField kUplinkBandwidth{21, 1};
-constexpr RecordField kCellIdentity{22, 4};
-constexpr RecordField kTrackingAreaCode{26, 2};
-constexpr RecordField kBand{28, 4};
-}  // namespace cell_identity
-
-// 0xB0C1, antenna information; of the rest of the record nothing is read.
-namespace antenna_info {
-constexpr std::uint16_t kCode = 0xB0C1;
-constexpr std::size_t kSize = 22;
-constexpr RecordField kVersion{13, 1};
-constexpr RecordField kTxAntennas{20, 1};
-}  // namespace antenna_info
-
-// 0xB17F, serving cell measurement.
-namespace serving_measurement {
-constexpr std::uint16_t kCode = 0xB17F;
-constexpr std::size_t kSize = 33;
-constexpr RecordField kVersion{13, 1};
-constexpr RecordField kEarfcn{17, 2};
-constexpr RecordField kPhysicalCellId{19, 2, 0, 8};
-constexpr RecordField kLayerPriority{20, 1, 1, 4};
-constexpr RecordField kMeasuredRsrp{21, 4, 0, 8};
-constexpr RecordField kAverageRsrp{21, 4, 9, 17};
-constexpr RecordField kMeasuredRsrq{21, 4, 18, 24};
-constexpr RecordField kAverageRsrq{21, 4, 25, 31};
-constexpr RecordField kRssi{25, 2, 0, 8};
-constexpr RecordField kQrxlevmin{26, 1, 1, 6};
-constexpr RecordField kPMax{25, 4, 15, 21};
-constexpr RecordField kMaxUeTxPower{25, 4, 22, 27};
-constexpr RecordField kSrxlev{29, 1, 0, 6};
-constexpr RecordField kDrxCyclesBelowZero{29, 2, 7, 12};
-constexpr RecordField kSIntraSearch{29, 4, 13, 18};
-constexpr RecordField kSNonIntraSearch{29, 4, 19, 24};
-constexpr RecordField kRulesUpdated{32, 1, 1, 1};
-constexpr RecordField kRules{32, 1, 2, 5};
-}  // namespace serving_measurement
-
-// 0xB179, intra-frequency measurement: measured neighbours (6 bytes each from
-// 29), then detected ones (2 bytes each).
-namespace intra_frequency {
-constexpr std::uint16_t kCode = 0xB179;
-constexpr std::size_t kFirstCell = 29;
-constexpr std::size_t kMeasuredSize = 6;
-constexpr std::size_t kDetectedSize = 2;
-constexpr RecordField kVersion{13, 1};
-constexpr RecordField kEarfcn{17, 2};
-constexpr RecordField kServingPhysicalCellId{19, 2};
-constexpr RecordField kSubframeNumber{21, 2};
-constexpr RecordField kServingFilteredRsrp{23, 2};
-constexpr RecordField kServingFilteredRsrq{25, 2};
-constexpr RecordField kMeasuredCount{27, 1};
-constexpr RecordField kDetectedCount{28, 1};
-// Within a measured neighbour:
-constexpr RecordField kPhysicalCellId{0, 2};
-constexpr RecordField kFilteredRsrp{2, 2};
-constexpr RecordField kFilteredRsrq{4, 2};
-// A detected neighbour:
-constexpr RecordField kDetectedPhysicalCellId{0, 2};
-}  // namespace intra_frequency
-
-// 0xB180, neighbour measurement of one frequency: cells of 20 bytes from 21.
-namespace neighbour_measurement {
-constexpr std::uint16_t kCode = 0xB180;
-constexpr std::size_t kFirstCell = 21;
-constexpr std::size_t kCellSize = 20;
-constexpr std::size_t kMostCells = 32;
-constexpr RecordField kVersion{13, 1};
-constexpr RecordField kEarfcn{17, 2};
-constexpr RecordField kQrxlevmin{19, 1, 0, 5};
-constexpr RecordField kCellsLessOne{19, 2, 6, 10};
-// Within a cell:
-constexpr RecordField kPhysicalCellId{0, 2, 0, 8};
-constexpr RecordField kRssi{0, 4, 9, 16};
-constexpr RecordField kMeasuredRsrp{0, 4, 17, 25};
-constexpr RecordField kAverageRsrp{4, 2, 0, 8};
-constexpr RecordField kMeasuredRsrq{4, 2, 9, 15};
-constexpr RecordField kAverageRsrq{6, 1, 0, 6};
-constexpr RecordField kSrxlev{4, 4, 23, 29};
-constexpr RecordField kFrequencyOffset{8, 2};
-constexpr RecordField kFrameOffset{12, 2, 0, 10};
-constexpr RecordField kSampleOffset{12, 4, 11, 29};
-}  // namespace neighbour_measurement
-
-// 0xB186, reselection candidates: a 4-byte header per candidate from 21, the
-// candidate's own fields behind it.
-namespace reselection {
-constexpr std::uint16_t kCode = 0xB186;
-constexpr std::size_t kFirstCandidate = 21;
-constexpr std::size_t kCandidateSize = 8;
-constexpr RecordField kVersion{13, 1};
-constexpr RecordField kServingEarfcn{15, 2};
-constexpr RecordField kServingPhysicalCellId{17, 2};
-constexpr RecordField kCount{19, 2};
-// Within a candidate:
-constexpr RecordField kPriority{0, 2};
-constexpr RecordField kTechnology{2, 2};
-constexpr RecordField kLteEarfcn{4, 2};
-constexpr RecordField kLtePhysicalCellId{6, 2, 7, 15};
-constexpr RecordField kUtranUarfcn{4, 2};
-constexpr RecordField kUtranPsc{6, 2};
-constexpr RecordField kGeranArfcn{4, 2};
-constexpr RecordField kGeranBand{6, 1};
-constexpr RecordField kGeranBsic{7, 1};
-}  // namespace reselection
-
-// --- Field values: the x that a decoder's "x × step + origin" turns into the value ---
-
-std::uint32_t steps(double value, double origin, double step) {
-  const double x = (value - origin) / step;
-  if (x < 0 || x != std::floor(x)) {
-    throw std::logic_error(std::to_string(value) + " is no whole number of " + std::to_string(step) +
-                           " steps from " + std::to_string(origin));
-  }
-  return static_cast<std::uint32_t>(x);
-}
-
-// RSRP of the serving cell and of the connected-mode measurement, quarter-dB steps.
-std::uint32_t rsrpField(double dbm) { return steps(dbm, -140, 0.25); }
-// RSSI, and the RSRP of 0xB180's cells, half-dB steps.
-std::uint32_t halfDbmField(double dbm) { return steps(dbm, -140, 0.5); }
-// RSRQ of 0xB17F and 0xB180.
-std::uint32_t rsrqField(double db) { return steps(db, -30, 0.25); }
-// RSRQ of 0xB179.
-std::uint32_t connectedRsrqField(double db) { return steps(db, -20, 0.125); }
-// Srxlev, P-Max and the UE's maximum power.
-std::uint32_t offset30Field(int dbm) { return steps(dbm, -30, 1); }
-std::uint32_t qrxlevminField(int dbm) { return steps(dbm, -140, 2); }
-// S-IntraSearch and S-NonIntraSearch, 2 dB steps.
-std::uint32_t searchField(int db) { return steps(db, 0, 2); }
 
 // --- The network's settings ---
 
@@ -284,12 +150,12 @@ struct LteRadioEncoder::Report {
 std::span<const LteRadioEncoder::Report> LteRadioEncoder::reports() {
   // In the order the records of one period go out.
   static constexpr std::array<Report, 6> kReports = {{
-      {cell_identity::kCode, 2000ms, &LteRadioEncoder::servingCellIdentity},
-      {antenna_info::kCode, 2000ms, &LteRadioEncoder::antennaInfo},
-      {serving_measurement::kCode, 320ms, &LteRadioEncoder::servingCellMeasurement},
-      {intra_frequency::kCode, 640ms, &LteRadioEncoder::intraFrequencyMeasurement},
-      {neighbour_measurement::kCode, 640ms, &LteRadioEncoder::neighbourMeasurement},
-      {reselection::kCode, 1280ms, &LteRadioEncoder::reselectionCandidates},
+      {lte::cell_identity::kCode, 2000ms, &LteRadioEncoder::servingCellIdentity},
+      {lte::antenna_info::kCode, 2000ms, &LteRadioEncoder::antennaInfo},
+      {lte::serving_measurement::kCode, 320ms, &LteRadioEncoder::servingCellMeasurement},
+      {lte::intra_frequency::kCode, 640ms, &LteRadioEncoder::intraFrequencyMeasurement},
+      {lte::neighbor_measurement::kCode, 640ms, &LteRadioEncoder::neighbourMeasurement},
+      {lte::reselection::kCode, 1280ms, &LteRadioEncoder::reselectionCandidates},
   }};
   static_assert(std::all_of(kReports.begin(), kReports.end(),
                             [](const Report& r) { return r.every % LogCodeSimulator::kPeriod == 0ms; }),
@@ -312,9 +178,9 @@ void LteRadioEncoder::encode(const SimulatedNetwork& network, std::uint64_t peri
 // --- Records ---
 
 std::optional<Bytes> LteRadioEncoder::servingCellIdentity(const SimulatedNetwork& network, std::uint64_t timestamp) {
-  using namespace cell_identity;
+  using namespace lte::cell_identity;
   const Cell& serving = network.servingCell();
-  RecordWriter record(kSize);
+  RecordWriter record(kMinimumLength);
   record.put(kVersion, kRecordVersion);
   record.put(kPhysicalCellId, static_cast<std::uint32_t>(serving.code));
   record.put(kDownlinkEarfcn, static_cast<std::uint32_t>(serving.channel));
@@ -328,15 +194,15 @@ std::optional<Bytes> LteRadioEncoder::servingCellIdentity(const SimulatedNetwork
 }
 
 std::optional<Bytes> LteRadioEncoder::antennaInfo(const SimulatedNetwork& network, std::uint64_t timestamp) {
-  using namespace antenna_info;
-  RecordWriter record(kSize);
+  using namespace lte::antenna_info;
+  RecordWriter record(kMinimumLength);
   record.put(kVersion, kRecordVersion);
   record.put(kTxAntennas, static_cast<std::uint32_t>(layerOf(network.servingCell()).txAntennas));
   return record.packet(kCode, timestamp);
 }
 
 std::optional<Bytes> LteRadioEncoder::servingCellMeasurement(const SimulatedNetwork& network, std::uint64_t timestamp) {
-  using namespace serving_measurement;
+  using namespace lte::serving_measurement;
   const Cell& serving = network.servingCell();
   const Layer& layer = layerOf(serving);
   const int srxlev = srxlevOf(serving);
@@ -347,58 +213,59 @@ std::optional<Bytes> LteRadioEncoder::servingCellMeasurement(const SimulatedNetw
   const bool rulesUpdated = rules != lastRules_;
   lastRules_ = rules;
 
-  RecordWriter record(kSize);
+  RecordWriter record(kMinimumLength);
   record.put(kVersion, kRecordVersion);
   record.put(kEarfcn, static_cast<std::uint32_t>(serving.channel));
   record.put(kPhysicalCellId, static_cast<std::uint32_t>(serving.code));
   record.put(kLayerPriority, static_cast<std::uint32_t>(layer.priority));
-  record.put(kMeasuredRsrp, rsrpField(serving.rsrp));
-  record.put(kAverageRsrp, rsrpField(serving.averageRsrp));
-  record.put(kMeasuredRsrq, rsrqField(serving.rsrq));
-  record.put(kAverageRsrq, rsrqField(serving.averageRsrq));
-  record.put(kRssi, halfDbmField(serving.level));
-  record.put(kQrxlevmin, qrxlevminField(layer.qrxlevmin));
-  record.put(kPMax, offset30Field(layer.pMax));
-  record.put(kMaxUeTxPower, offset30Field(kUePowerClassDbm));
-  record.put(kSrxlev, offset30Field(srxlev));
+  record.putValue(kMeasuredRsrp, serving.rsrp);
+  record.putValue(kAverageRsrp, serving.averageRsrp);
+  record.putValue(kMeasuredRsrq, serving.rsrq);
+  record.putValue(kAverageRsrq, serving.averageRsrq);
+  record.putValue(kRssi, serving.level);
+  record.putValue(kQrxlevmin, layer.qrxlevmin);
+  record.putValue(kPMax, layer.pMax);
+  record.putValue(kMaxUeTxPower, kUePowerClassDbm);
+  record.putValue(kSrxlev, srxlev);
   record.put(kDrxCyclesBelowZero, static_cast<std::uint32_t>(reportsBelowZero_));
-  record.put(kSIntraSearch, searchField(layer.sIntraSearch));
-  record.put(kSNonIntraSearch, searchField(layer.sNonIntraSearch));
+  record.putValue(kSIntraSearch, layer.sIntraSearch);
+  record.putValue(kSNonIntraSearch, layer.sNonIntraSearch);
   record.put(kRulesUpdated, rulesUpdated ? 1 : 0);
   record.put(kRules, rules);
   return record.packet(kCode, timestamp);
 }
 
 std::optional<Bytes> LteRadioEncoder::intraFrequencyMeasurement(const SimulatedNetwork& network, std::uint64_t timestamp) {
-  using namespace intra_frequency;
+  using namespace lte::intra_frequency;
   const Cell& serving = network.servingCell();
   const auto measured = neighboursOn(network, serving.channel, true);
   const auto detected = neighboursOn(network, serving.channel, false);
-  RecordWriter record(kFirstCell + kMeasuredSize * measured.size() + kDetectedSize * detected.size());
+  RecordWriter record(kMeasuredCells.first + kMeasuredCells.entrySize * measured.size() +
+                      kDetectedCellSize * detected.size());
   record.put(kVersion, kRecordVersion);
   record.put(kEarfcn, static_cast<std::uint32_t>(serving.channel));
   record.put(kServingPhysicalCellId, static_cast<std::uint32_t>(serving.code));
   record.put(kSubframeNumber, subframeNumberAt(timestamp));
-  record.put(kServingFilteredRsrp, rsrpField(serving.averageRsrp));
-  record.put(kServingFilteredRsrq, connectedRsrqField(serving.averageRsrq));
+  record.putValue(kServingFilteredRsrp, serving.averageRsrp);
+  record.putValue(kServingFilteredRsrq, serving.averageRsrq);
   record.put(kMeasuredCount, static_cast<std::uint32_t>(measured.size()));
   record.put(kDetectedCount, static_cast<std::uint32_t>(detected.size()));
-  std::size_t entry = kFirstCell;
+  std::size_t entry = kMeasuredCells.first;
   for (const Cell* cell : measured) {
-    record.put(kPhysicalCellId.at(entry), static_cast<std::uint32_t>(cell->code));
-    record.put(kFilteredRsrp.at(entry), rsrpField(cell->averageRsrp));
-    record.put(kFilteredRsrq.at(entry), connectedRsrqField(cell->averageRsrq));
-    entry += kMeasuredSize;
+    record.put(kNeighborPhysicalCellId.at(entry), static_cast<std::uint32_t>(cell->code));
+    record.putValue(kNeighborFilteredRsrp.at(entry), cell->averageRsrp);
+    record.putValue(kNeighborFilteredRsrq.at(entry), cell->averageRsrq);
+    entry += kMeasuredCells.entrySize;
   }
   for (const Cell* cell : detected) {
     record.put(kDetectedPhysicalCellId.at(entry), static_cast<std::uint32_t>(cell->code));
-    entry += kDetectedSize;
+    entry += kDetectedCellSize;
   }
   return record.packet(kCode, timestamp);
 }
 
 std::optional<Bytes> LteRadioEncoder::neighbourMeasurement(const SimulatedNetwork& network, std::uint64_t timestamp) {
-  using namespace neighbour_measurement;
+  using namespace lte::neighbor_measurement;
   // The frequency after the one reported last that has a measured neighbour.
   const std::vector<int> channels = neighbourChannels(network);
   const auto last = lastNeighbourChannel_ ? std::find(channels.begin(), channels.end(), *lastNeighbourChannel_)
@@ -411,24 +278,24 @@ std::optional<Bytes> LteRadioEncoder::neighbourMeasurement(const SimulatedNetwor
     if (cells.size() > kMostCells) cells.resize(kMostCells);
     lastNeighbourChannel_ = channel;
 
-    RecordWriter record(kFirstCell + kCellSize * cells.size());
+    RecordWriter record(kCells.first + kCells.entrySize * cells.size());
     record.put(kVersion, kRecordVersion);
     record.put(kEarfcn, static_cast<std::uint32_t>(channel));
-    record.put(kQrxlevmin, qrxlevminField(layerOf(*cells.front()).qrxlevmin));
+    record.putValue(kQrxlevmin, layerOf(*cells.front()).qrxlevmin);
     record.put(kCellsLessOne, static_cast<std::uint32_t>(cells.size() - 1));
-    std::size_t entry = kFirstCell;
+    std::size_t entry = kCells.first;
     for (const Cell* cell : cells) {
       record.put(kPhysicalCellId.at(entry), static_cast<std::uint32_t>(cell->code));
-      record.put(kRssi.at(entry), halfDbmField(cell->level));
-      record.put(kMeasuredRsrp.at(entry), halfDbmField(cell->rsrp));
-      record.put(kAverageRsrp.at(entry), halfDbmField(cell->averageRsrp));
-      record.put(kMeasuredRsrq.at(entry), rsrqField(cell->rsrq));
-      record.put(kAverageRsrq.at(entry), rsrqField(cell->averageRsrq));
-      record.put(kSrxlev.at(entry), offset30Field(srxlevOf(*cell)));
+      record.putValue(kRssi.at(entry), cell->level);
+      record.putValue(kMeasuredRsrp.at(entry), cell->rsrp);
+      record.putValue(kAverageRsrp.at(entry), cell->averageRsrp);
+      record.putValue(kMeasuredRsrq.at(entry), cell->rsrq);
+      record.putValue(kAverageRsrq.at(entry), cell->averageRsrq);
+      record.putValue(kSrxlev.at(entry), srxlevOf(*cell));
       record.put(kFrequencyOffset.at(entry), frequencyOffsetOf(*cell));
       record.put(kFrameOffset.at(entry), frameOffsetOf(*cell));
       record.put(kSampleOffset.at(entry), sampleOffsetOf(*cell));
-      entry += kCellSize;
+      entry += kCells.entrySize;
     }
     return record.packet(kCode, timestamp);
   }
@@ -436,7 +303,7 @@ std::optional<Bytes> LteRadioEncoder::neighbourMeasurement(const SimulatedNetwor
 }
 
 std::optional<Bytes> LteRadioEncoder::reselectionCandidates(const SimulatedNetwork& network, std::uint64_t timestamp) {
-  using namespace reselection;
+  using namespace lte::reselection;
   const Cell& serving = network.servingCell();
   const std::uint64_t number = reselectionRecords_++;
   const auto& interRat = network.interRatNeighbours();
@@ -452,12 +319,13 @@ std::optional<Bytes> LteRadioEncoder::reselectionCandidates(const SimulatedNetwo
   }
   const bool hasCandidate = otherAccess || strongest;
 
-  RecordWriter writer(kFirstCandidate + (hasCandidate ? kCandidateSize : 0));
+  // A candidate of any of the technologies written here takes 8 bytes.
+  RecordWriter writer(kCandidates.first + (hasCandidate ? kLteSize : 0));
   writer.put(kVersion, kRecordVersion);
   writer.put(kServingEarfcn, static_cast<std::uint32_t>(serving.channel));
-  writer.put(kServingPhysicalCellId, static_cast<std::uint32_t>(serving.code));
+  writer.put(kServingCellId, static_cast<std::uint32_t>(serving.code));
   writer.put(kCount, hasCandidate ? 1 : 0);
-  const std::size_t at = kFirstCandidate;
+  const std::size_t at = kCandidates.first;
   if (otherAccess) {
     writer.put(kPriority.at(at), static_cast<std::uint32_t>(interRatPriority(otherAccess->access)));
     writer.put(kTechnology.at(at), candidateTechnology(otherAccess->access));
@@ -473,7 +341,7 @@ std::optional<Bytes> LteRadioEncoder::reselectionCandidates(const SimulatedNetwo
     writer.put(kPriority.at(at), static_cast<std::uint32_t>(layerOf(*strongest).priority));
     writer.put(kTechnology.at(at), candidateTechnology(Access::LTE));
     writer.put(kLteEarfcn.at(at), static_cast<std::uint32_t>(strongest->channel));
-    writer.put(kLtePhysicalCellId.at(at), static_cast<std::uint32_t>(strongest->code));
+    writer.put(kLteCellId.at(at), static_cast<std::uint32_t>(strongest->code));
   }
   return writer.packet(kCode, timestamp);
 }

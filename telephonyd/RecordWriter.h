@@ -13,21 +13,13 @@
 #include <cstddef>
 #include <cstdint>
 
+#include "LogGenerator/records/Field.h"
 #include "platform/Value.h"
 
 namespace corvane::telephonyd {
 
-// A field of a record layout: `bytes` (1, 2 or 4) little-endian bytes at
-// `offset`, of which bits first..last hold the value (all of them by default).
-struct RecordField {
-  std::size_t offset = 0;
-  unsigned bytes = 1;
-  unsigned first = 0;
-  unsigned last = 8 * bytes - 1;
-
-  // The same field in the list entry that begins `entry` bytes into the record.
-  constexpr RecordField at(std::size_t entry) const { return {offset + entry, bytes, first, last}; }
-};
+// A field of a record layout, as the decoders read it.
+using RecordField = records::Field;
 
 class RecordWriter {
  public:
@@ -39,6 +31,10 @@ class RecordWriter {
   // than the field or a field wider than its bytes, and std::logic_error for
   // a bit that an earlier field already wrote.
   void put(const RecordField& field, std::uint32_t value);
+  // Puts the raw value that the field's conversion shows as `value` (an RSRP
+  // in dBm, say). Throws std::logic_error for a value the conversion cannot
+  // show exactly.
+  void putValue(const RecordField& field, double value) { put(field, field.conversion.rawFor(value)); }
 
   // The finished packet: type 0x01, record length, code, timestamp, payload.
   Bytes packet(std::uint16_t code, std::uint64_t timestamp) const;

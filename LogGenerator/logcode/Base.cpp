@@ -3,6 +3,7 @@
 #include <array>
 
 #include "LogGenerator/logcode/ArrayLock.h"
+#include "platform/Assertion.h"
 #include "platform/Log.h"
 
 namespace corvane {
@@ -62,6 +63,27 @@ constexpr std::array<EcnoStep, 32> kEcnoSteps = {{
 constexpr std::uint32_t kEcnoUnity = 524288;
 
 }  // namespace
+
+std::shared_ptr<Base> Base::initWithDict(const SectionDescriptor& descriptor, ClassDictionary& classDict,
+                                         CodeDictionary& codeDict) {
+  std::shared_ptr<Base> section = descriptor.make();
+  section->descriptor_ = &descriptor;
+  classDict[std::string(descriptor.name)] = section;
+  section->updateLogCodeDict(codeDict);
+  return section;
+}
+
+std::string Base::getSectionName() const {
+  if (!descriptor_) raiseAssertionFailure("getSectionName: a section without a table row must name itself", __FILE__, __LINE__);
+  return std::string(descriptor_->name);
+}
+
+std::vector<std::uint32_t> Base::getLogCodeArray() const {
+  if (!descriptor_) {
+    raiseAssertionFailure("getLogCodeArray: a section without a table row must list its codes", __FILE__, __LINE__);
+  }
+  return {descriptor_->codes.begin(), descriptor_->codes.end()};
+}
 
 void Base::updateSectionRef(const Value& container) {
   if (const Dictionary* d = container.asDictionary()) {

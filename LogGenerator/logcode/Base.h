@@ -21,6 +21,8 @@
 #include <vector>
 
 #include "LogGenerator/logcode/PacketView.h"
+#include "LogGenerator/logcode/SectionTable.h"
+#include "LogGenerator/records/Field.h"
 #include "platform/Value.h"
 
 namespace corvane {
@@ -38,6 +40,8 @@ class BoundedList {
  public:
   BoundedList(std::size_t count, std::size_t firstOffset, std::size_t stride)
       : count_(count), firstOffset_(firstOffset), stride_(stride) {}
+  BoundedList(std::size_t count, records::EntryList entries)
+      : BoundedList(count, entries.first, entries.entrySize) {}
   std::size_t count() const { return count_; }
   // The absolute offset of entry i; throws ArrayOutOfBoundsException when i >= count.
   std::size_t entryOffset(std::size_t i) const {
@@ -81,8 +85,12 @@ class Base : public std::enable_shared_from_this<Base> {
   Base(const Base&) = delete;
   Base& operator=(const Base&) = delete;
 
-  // Makes a section of class S and registers it: in the class dictionary under
-  // its own section name, and in the code dictionary for each of its codes.
+  // Makes the section a table row describes and registers it: in the class
+  // dictionary under its name, and in the code dictionary for each of its codes.
+  static std::shared_ptr<Base> initWithDict(const SectionDescriptor& descriptor, ClassDictionary& classDict,
+                                            CodeDictionary& codeDict);
+  // The same for a section of class S that names itself (it overrides
+  // getSectionName and getLogCodeArray).
   template <class S, class... Args>
   static std::shared_ptr<S> initWithDict(ClassDictionary& classDict, CodeDictionary& codeDict, Args&&... args) {
     auto section = std::make_shared<S>(std::forward<Args>(args)...);
@@ -98,10 +106,13 @@ class Base : public std::enable_shared_from_this<Base> {
 
   // One packet (prefix removed, header included) with its effective log code.
   virtual void updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) = 0;
-  // The display key of the section.
-  virtual std::string getSectionName() const = 0;
-  // The section's log codes; extra codes as 0xFF0000 + n.
-  virtual std::vector<std::uint32_t> getLogCodeArray() const = 0;
+  // The display key of the section: its table row's name. A section made
+  // without a table row must override it; not doing so is a programming error
+  // that ends the process.
+  virtual std::string getSectionName() const;
+  // The section's log codes, extra codes as 0xFF0000 + n: its table row's, or
+  // the override's, as for the name.
+  virtual std::vector<std::uint32_t> getLogCodeArray() const;
 
   // Subscribes the section to each of its codes (twice if listed twice).
   void updateLogCodeDict(CodeDictionary& codeDict);
@@ -138,6 +149,8 @@ class Base : public std::enable_shared_from_this<Base> {
 
  private:
   std::variant<std::monostate, Dictionary::Weak, Array::Weak> sectionRef;
+  // The table row the section was made from, if any.
+  const SectionDescriptor* descriptor_ = nullptr;
 };
 
 }  // namespace corvane

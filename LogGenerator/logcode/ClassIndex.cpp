@@ -20,6 +20,18 @@ void ClassIndex::printTeardownLine(const char* line) {
   std::fflush(out);
 }
 
+ClassIndex::ClassIndex(SectionTable sections) {
+  sections_.reserve(sections.size());
+  for (const SectionDescriptor& descriptor : sections) {
+    sections_.push_back(Base::initWithDict(descriptor, classDict, codeDictionary));
+  }
+}
+
+void ClassIndex::releaseSections() {
+  for (auto& section : sections_) section.reset();
+  sections_.clear();
+}
+
 ClassIndex::~ClassIndex() {
   printTeardownLine("Deallocing ClassIndex");
   classDict.clear();

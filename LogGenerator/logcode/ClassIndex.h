@@ -3,8 +3,8 @@
 // The registry of one technology's sections: it owns them, finds a section by
 // its display name for the template processor, names the subscribers of a log
 // code for the packet dispatcher, and lists every code for the start command.
-// A technology subclass makes its sections in its constructor; from then on the
-// registries do not change.
+// A technology's index makes its sections from the technology's table
+// (SectionTable.h), in table order; from then on the registries do not change.
 
 #include <cstdint>
 #include <cstdio>
@@ -18,7 +18,10 @@ namespace corvane {
 
 class ClassIndex {
  public:
+  // An index without sections.
   ClassIndex() = default;
+  // An index of the sections of a table, made in table order.
+  explicit ClassIndex(SectionTable sections);
   // Prints "Deallocing ClassIndex" on standard output.
   virtual ~ClassIndex();
   ClassIndex(const ClassIndex&) = delete;
@@ -41,14 +44,16 @@ class ClassIndex {
   std::vector<std::string> sectionNames() const;
 
  protected:
-  // Makes a section of class S registered in this index.
-  template <class S>
-  std::shared_ptr<S> makeSection() {
-    return Base::initWithDict<S>(classDict, codeDictionary);
-  }
+  // Releases the index's own references to its sections, in table order (the
+  // dictionaries keep theirs until the index's own teardown).
+  void releaseSections();
 
   ClassDictionary classDict;
   CodeDictionary codeDictionary;
+
+ private:
+  // One owning reference per table row, in table order.
+  std::vector<std::shared_ptr<Base>> sections_;
 };
 
 }  // namespace corvane

@@ -1,26 +1,30 @@
 #include "LogGenerator/lte/ConnectedModeMeasurementMisc.h"
 
-#include "LogGenerator/lte/LteConversions.h"
-#include "platform/Log.h"
+#include "LogGenerator/logcode/Rows.h"
+#include "LogGenerator/lte/records/IntraFrequencyMeasurementRecord.h"
 
 namespace corvane {
 
 namespace {
-constexpr std::size_t kMinimumLength = 29;
+
+using namespace lte::intra_frequency;
+
+constexpr RowField kRows[] = {
+    {"E-ARFCN", kEarfcn},
+    {"Serving Physical Cell ID", kServingPhysicalCellId},
+    {"Subframe Number", kSubframeNumber},
+    {"Serving Filtered RSRP", kServingFilteredRsrp},
+    {"Serving Filtered RSRQ", kServingFilteredRsrq},
+};
+
 }  // namespace
 
 void ConnectedModeMeasurementMisc::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
-  const auto accepted =
-      acceptPacket("Connected mode LTE Intra-frequency Measurement", data, logCode,
-                   lte::kConnectedIntraFrequencyCode, kMinimumLength);
-  if (!accepted) return;
-  const PacketView& packet = *accepted;
-  lte::RowWriter rows(*this);
-  rows.set("E-ARFCN", lte::decimalText(packet.le16(17)));
-  rows.set("Serving Physical Cell ID", lte::decimalText(packet.le16(19)));
-  rows.set("Subframe Number", lte::decimalText(packet.le16(21)));
-  rows.set("Serving Filtered RSRP", lte::rsrpText(packet.le16(23)));
-  rows.set("Serving Filtered RSRQ", lte::rsrqText(packet.le16(25)));
+  const auto packet =
+      acceptPacket("Connected mode LTE Intra-frequency Measurement", data, logCode, kCode, kMinimumLength);
+  if (!packet) return;
+  RowWriter rows(*this);
+  writeRows(rows, kRows, *packet);
 }
 
 }  // namespace corvane

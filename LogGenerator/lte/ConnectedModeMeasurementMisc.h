@@ -11,8 +11,6 @@ namespace corvane {
 class ConnectedModeMeasurementMisc final : public Base {
  public:
   void updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) override;
-  std::string getSectionName() const override { return "Connected mode LTE Intra-frequency Measurement"; }
-  std::vector<std::uint32_t> getLogCodeArray() const override { return {0xB179}; }
 };
 
 }  // namespace corvane

@@ -11,8 +11,6 @@ namespace corvane {
 class DetectedCells final : public Base {
  public:
   void updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) override;
-  std::string getSectionName() const override { return "Detected Cells"; }
-  std::vector<std::uint32_t> getLogCodeArray() const override { return {0xB179}; }
 
   // The detected cells of a record: the count at byte 28, then 2 bytes a cell
   // behind the measured neighbours.

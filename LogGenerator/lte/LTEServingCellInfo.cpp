@@ -3,7 +3,8 @@
 #include <array>
 
 #include "LogGenerator/logcode/ExtraCodePayloads.h"
-#include "LogGenerator/lte/LteConversions.h"
+#include "LogGenerator/logcode/Rows.h"
+#include "LogGenerator/lte/records/ServingCellIdentityRecord.h"
 #include "platform/CellMonitor.h"
 #include "platform/Log.h"
 
@@ -11,24 +12,18 @@ namespace corvane {
 
 namespace {
 
-using lte::RowWriter;
-
-constexpr std::size_t kAntennaInfoMinimumLength = 22;
-constexpr std::size_t kCellIdentityMinimumLength = 38;
-
-// Resource blocks of a carrier → its bandwidth.
-constexpr std::array<lte::ValueText, 6> kBandwidths = {{
-    {6, "1.4 MHz"},
-    {15, "3 MHz"},
-    {25, "5 MHz"},
-    {50, "10 MHz"},
-    {75, "15 MHz"},
-    {100, "20 MHz"},
-}};
-
-std::string_view bandwidthText(std::uint32_t resourceBlocks) {
-  return lte::textFor(kBandwidths, resourceBlocks, "Unknown");
-}
+constexpr RowField kCarrierRowsBeforeUarfcn[] = {
+    {"Physical Cell ID", lte::cell_identity::kPhysicalCellId},
+    {"Download Frequency", lte::cell_identity::kDownlinkEarfcn},
+    {"Upload Frequency", lte::cell_identity::kUplinkEarfcn},
+};
+constexpr RowField kCarrierRowsAfterUarfcn[] = {
+    {"Download Bandwidth", lte::cell_identity::kDownlinkBandwidth},
+    {"Upload Bandwidth", lte::cell_identity::kUplinkBandwidth},
+    {"Cell Identity", lte::cell_identity::kCellIdentity},
+    {"Tracking Area Code", lte::cell_identity::kTrackingAreaCode},
+    {"Freq Band Indicator", lte::cell_identity::kBand},
+};
 
 struct CellListRow {
   std::string_view cellMonitorKey;
@@ -72,34 +67,28 @@ void LTEServingCellInfo::updateWithData(std::span<const std::uint8_t> data, std:
   log::write(log::kWarning, "LTE Serving Cell Info");
   const PacketView packet(data);
   switch (logCode) {
-    case lte::kAntennaInfoCode: updateFromAntennaInfo(packet); return;
-    case lte::kServingCellIdentityCode: updateFromCellIdentity(packet); return;
+    case lte::antenna_info::kCode: updateFromAntennaInfo(packet); return;
+    case lte::cell_identity::kCode: updateFromCellIdentity(packet); return;
     case kExtraCodeCellList: updateFromCellList(data); return;
     default: logUnknownCode(logCode); return;
   }
 }
 
 void LTEServingCellInfo::updateFromAntennaInfo(const PacketView& packet) const {
-  if (packet.size() < kAntennaInfoMinimumLength) return;
-  RowWriter(*this).set("Num Tx Antennas", lte::decimalText(packet.u8(20)));
+  if (packet.size() < lte::antenna_info::kMinimumLength) return;
+  RowWriter(*this).set("Num Tx Antennas", fieldText(lte::antenna_info::kTxAntennas, packet));
   // The rest of this record is not decoded, and the trace has always said so.
-  logUnknownCode(lte::kAntennaInfoCode);
+  logUnknownCode(lte::antenna_info::kCode);
 }
 
 void LTEServingCellInfo::updateFromCellIdentity(const PacketView& packet) const {
-  if (packet.size() < kCellIdentityMinimumLength) return;
+  if (packet.size() < lte::cell_identity::kMinimumLength) return;
   RowWriter rows(*this);
-  rows.set("Physical Cell ID", lte::decimalText(packet.le16(14)));
-  rows.set("Download Frequency", lte::decimalText(packet.le16(16)));
-  rows.set("Upload Frequency", lte::decimalText(packet.le16(18)));
+  writeRows(rows, kCarrierRowsBeforeUarfcn, packet);
   // A UARFCN comes only with the cell-monitor list; a fresh baseband record of
   // the carrier makes the last one stale.
   rows.remove("UARFCN");
-  rows.set("Download Bandwidth", bandwidthText(packet.u8(20)));
-  rows.set("Upload Bandwidth", bandwidthText(packet.u8(21)));
-  rows.set("Cell Identity", lte::decimalText(packet.le32(22)));
-  rows.set("Tracking Area Code", lte::decimalText(packet.le16(26)));
-  rows.set("Freq Band Indicator", lte::decimalText(packet.le32(28)));
+  writeRows(rows, kCarrierRowsAfterUarfcn, packet);
 }
 
 void LTEServingCellInfo::updateFromCellList(std::span<const std::uint8_t> data) const {
@@ -115,7 +104,7 @@ void LTEServingCellInfo::updateFromCellList(std::span<const std::uint8_t> data) 
   // One missing value never hides the others.
   for (const auto& row : kCellListRows) {
     if (const auto value = CellInfoArray::integerValue(*serving, row.cellMonitorKey)) {
-      rows.set(row.row, lte::decimalText(*value));
+      rows.set(row.row, decimalText(*value));
     } else {
       log::write(log::kError, row.failure);
     }

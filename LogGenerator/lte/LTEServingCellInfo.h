@@ -11,8 +11,6 @@ namespace corvane {
 class LTEServingCellInfo final : public Base {
  public:
   void updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) override;
-  std::string getSectionName() const override { return "Serving Cell Info"; }
-  std::vector<std::uint32_t> getLogCodeArray() const override { return {0xB0C2, 0xB0C1, 0xFF0001}; }
 
  private:
   void updateFromAntennaInfo(const PacketView& packet) const;

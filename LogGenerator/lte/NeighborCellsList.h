@@ -11,14 +11,10 @@ namespace corvane {
 class NeighborCellsList final : public Base {
  public:
   void updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) override;
-  std::string getSectionName() const override { return "Neighbor Cells List"; }
-  std::vector<std::uint32_t> getLogCodeArray() const override { return {0xB180}; }
 
   // The cells of a record: bits 6-10 of the 16-bit value at 19 hold the count
   // less one, so a record always reports at least one cell; 20 bytes a cell
   // from offset 21.
-  static constexpr std::size_t kFirstCell = 21;
-  static constexpr std::size_t kCellSize = 20;
   static BoundedList cells(const PacketView& packet);
 };
 

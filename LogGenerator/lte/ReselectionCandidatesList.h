@@ -9,14 +9,13 @@
 // sends, and the list reads it so.
 
 #include "LogGenerator/logcode/Base.h"
+#include "LogGenerator/lte/records/ReselectionCandidatesRecord.h"
 
 namespace corvane {
 
 class ReselectionCandidatesList final : public Base {
  public:
   void updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) override;
-  std::string getSectionName() const override { return "Reselection Candidates List"; }
-  std::vector<std::uint32_t> getLogCodeArray() const override { return {0xB186}; }
 
   struct LteFields {
     std::uint32_t earfcn;
@@ -41,18 +40,18 @@ class ReselectionCandidatesList final : public Base {
   // One candidate, read where it begins.
   class Candidate {
    public:
-    static constexpr std::uint32_t kLte = 0;
-    static constexpr std::uint32_t kUtran = 1;
-    static constexpr std::uint32_t kGeran = 2;
-    static constexpr std::uint32_t kCdma1xRtt = 3;
-    static constexpr std::uint32_t kCdmaHrpd = 4;
+    static constexpr std::uint32_t kLte = ::corvane::lte::reselection::kLte;
+    static constexpr std::uint32_t kUtran = ::corvane::lte::reselection::kUtran;
+    static constexpr std::uint32_t kGeran = ::corvane::lte::reselection::kGeran;
+    static constexpr std::uint32_t kCdma1xRtt = ::corvane::lte::reselection::kCdma1xRtt;
+    static constexpr std::uint32_t kCdmaHrpd = ::corvane::lte::reselection::kCdmaHrpd;
     // The header: priority and technology.
-    static constexpr std::size_t kHeaderSize = 4;
+    static constexpr std::size_t kHeaderSize = ::corvane::lte::reselection::kHeaderSize;
 
     Candidate(const PacketView& packet, std::size_t offset) : packet_(packet), offset_(offset) {}
     std::size_t offset() const { return offset_; }
-    std::uint32_t priority() const { return packet_.le16(offset_); }
-    std::uint32_t technology() const { return packet_.le16(offset_ + 2); }
+    std::uint32_t priority() const { return ::corvane::lte::reselection::kPriority.raw(packet_, offset_); }
+    std::uint32_t technology() const { return ::corvane::lte::reselection::kTechnology.raw(packet_, offset_); }
     // How far from the candidate's start its fields reach: the header alone for
     // a technology the list does not know.
     std::size_t extent() const;
@@ -75,11 +74,8 @@ class ReselectionCandidatesList final : public Base {
   // 4 bytes from 21.
   class Candidates {
    public:
-    static constexpr std::size_t kFirstCandidate = 21;
-    static constexpr std::size_t kStride = 4;
-
     explicit Candidates(const PacketView& packet)
-        : packet_(packet), entries_(packet.le16(19), kFirstCandidate, kStride) {}
+        : packet_(packet), entries_(::corvane::lte::reselection::kCount.raw(packet), ::corvane::lte::reselection::kCandidates) {}
     // The whole 16-bit count, which bounds the accessor.
     std::size_t count() const { return entries_.count(); }
     // Only the low byte of the count says how many candidates the list shows.

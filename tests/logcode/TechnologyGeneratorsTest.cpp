@@ -1,4 +1,6 @@
-#include "LogGenerator/logcode/TechnologyGenerators.h"
+#include "LogGenerator/gsm_umts/QND_GSMLogGenerator.h"
+#include "LogGenerator/lte/LTELogGenerator.h"
+#include "LogGenerator/utran/UTRANLogGenerator.h"
 
 #include <gtest/gtest.h>
 

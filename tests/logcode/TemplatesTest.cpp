@@ -9,7 +9,9 @@
 #include <map>
 #include <set>
 
-#include "LogGenerator/logcode/TechnologyGenerators.h"
+#include "LogGenerator/gsm_umts/QND_GSMLogGenerator.h"
+#include "LogGenerator/lte/LTELogGenerator.h"
+#include "LogGenerator/utran/UTRANLogGenerator.h"
 #include "platform/Log.h"
 #include "platform/PropertyList.h"
 #include "platform/ResourceLocator.h"

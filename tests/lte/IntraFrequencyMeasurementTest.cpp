@@ -153,15 +153,15 @@ using Detected = test::LteSectionTest<DetectedCells>;
 
 TEST_F(Detected, NoMeasuredCellsAndTwoDetectedReadFromOffsets29And31) {
   const Array detectedList = attachList();
-  MeasuredNeighborCells measured;
+  const auto measured = test::makeLteSection<MeasuredNeighborCells>(classDict, codeDict);
   Array measuredList;
-  measured.updateSectionRef(Value(measuredList));
+  measured->updateSectionRef(Value(measuredList));
   Bytes p = logPacket(0xB179, 33);
   p[27] = 0;
   p[28] = 2;
   put16(p, 29, 0x0123);
   put16(p, 31, 0x01F4);
-  measured.updateWithData(p, 0xB179);
+  measured->updateWithData(p, 0xB179);
   feed(p, 0xB179);
   EXPECT_TRUE(measuredList.empty());
   ASSERT_EQ(detectedList.size(), 2u);

@@ -4,8 +4,10 @@
 
 #include <gtest/gtest.h>
 
-#include "LogGenerator/logcode/LTEClassIndex.h"
-#include "LogGenerator/logcode/TechnologyGenerators.h"
+#include "LogGenerator/lte/LTEClassIndex.h"
+#include "LogGenerator/gsm_umts/QND_GSMLogGenerator.h"
+#include "LogGenerator/lte/LTELogGenerator.h"
+#include "LogGenerator/utran/UTRANLogGenerator.h"
 #include "platform/Log.h"
 #include "support/Packets.h"
 #include "support/Values.h"

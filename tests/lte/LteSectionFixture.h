@@ -10,15 +10,23 @@
 #include <vector>
 
 #include "LogGenerator/logcode/Base.h"
+#include "LogGenerator/lte/LTEClassIndex.h"
 #include "platform/Log.h"
 #include "support/Packets.h"
 
 namespace corvane::test {
 
+// A section made from its row of the LTE table, registered in the two dictionaries.
+template <class Section>
+std::shared_ptr<Section> makeLteSection(ClassDictionary& classDict, CodeDictionary& codeDict) {
+  return std::static_pointer_cast<Section>(
+      Base::initWithDict(*findSection<Section>(LTEClassIndex::sections()), classDict, codeDict));
+}
+
 template <class Section>
 class LteSectionTest : public ::testing::Test {
  protected:
-  LteSectionTest() : section(Base::initWithDict<Section>(classDict, codeDict)) {}
+  LteSectionTest() : section(makeLteSection<Section>(classDict, codeDict)) {}
 
   // Gives the section a dictionary of rows (as the display template does).
   Dictionary attachRows() {

@@ -1,4 +1,4 @@
-#include "LogGenerator/gsm_umts/CellChangeCounters.h"
+#include "LogGenerator/shared/CellChangeCounters.h"
 
 #include "platform/Log.h"
 

@@ -1,4 +1,4 @@
-#include "LogGenerator/gsm_umts/CodingScheme.h"
+#include "LogGenerator/shared/CodingScheme.h"
 
 #include "platform/Log.h"
 

@@ -1,4 +1,4 @@
-#include "LogGenerator/gsm_umts/SimInfo.h"
+#include "LogGenerator/shared/SimInfo.h"
 
 #include <array>
 #include <string_view>

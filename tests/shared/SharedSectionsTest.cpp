@@ -3,10 +3,11 @@
 
 #include <gtest/gtest.h>
 
-#include "LogGenerator/gsm_umts/CellChangeCounters.h"
-#include "LogGenerator/gsm_umts/CodingScheme.h"
-#include "LogGenerator/gsm_umts/PDPContextList.h"
-#include "LogGenerator/gsm_umts/SimInfo.h"
+#include "LogGenerator/shared/CellChangeCounters.h"
+#include "LogGenerator/shared/CodingScheme.h"
+#include "LogGenerator/shared/PDPContextList.h"
+#include "LogGenerator/shared/SimInfo.h"
+#include "LogGenerator/gsm_umts/QND_GSMClassIndex.h"
 #include "LogGenerator/logcode/ExtraCodePayloads.h"
 #include "platform/Log.h"
 #include "support/Packets.h"
@@ -26,9 +27,11 @@ const std::vector<std::string> kSimRows = {
     "EF-GPRS/PS-LOCI", "EF-ACCESS CONTROL CLASS", "EF-ADMINISTRATIVE DATA", "EF-FPLMN", "EF-ACTING HPLMN",
     "EF-RAT MODE", "EF-PLMN NETWORK NAME", "EF-OPERATOR PLMN LIST", "EF-OPLMNAcT"};
 
+// Made from the GSM/UMTS table, which holds all four.
 template <class S>
 std::shared_ptr<S> make(ClassDictionary& classDict, CodeDictionary& codeDict) {
-  return Base::initWithDict<S>(classDict, codeDict);
+  return std::static_pointer_cast<S>(
+      Base::initWithDict(*findSection<S>(QND_GSMClassIndex::sections()), classDict, codeDict));
 }
 
 class Shared : public ::testing::Test {

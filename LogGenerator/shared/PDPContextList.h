@@ -10,8 +10,6 @@ namespace corvane {
 class PDPContextList final : public Base {
  public:
   void updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) override;
-  std::string getSectionName() const override { return "PDP Context Info"; }
-  std::vector<std::uint32_t> getLogCodeArray() const override { return {0xFF0002}; }
 };
 
 }  // namespace corvane

@@ -1,4 +1,4 @@
-#include "LogGenerator/gsm_umts/PDPContextList.h"
+#include "LogGenerator/shared/PDPContextList.h"
 
 #include "LogGenerator/logcode/ExtraCodePayloads.h"
 #include "platform/Log.h"

@@ -1,0 +1,64 @@
+#pragma once
+
+// Display texts of decoded fields. A text is short and lives in the object
+// until it is copied, once, into the display's string: a row costs no heap
+// allocation of its own on the way.
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <span>
+#include <string_view>
+
+#include "LogGenerator/records/Field.h"
+
+namespace corvane {
+
+class Text {
+ public:
+  static constexpr std::size_t kCapacity = 32;
+  Text() = default;
+  // A constant text; longer ones are cut at kCapacity.
+  explicit Text(std::string_view text) : size_(static_cast<std::uint8_t>(text.copy(chars_.data(), kCapacity))) {}
+  std::string_view view() const { return {chars_.data(), size_}; }
+  operator std::string_view() const { return view(); }
+
+  // For the text makers: the characters are written in place, then counted.
+  char* begin() { return chars_.data(); }
+  void setEnd(const char* end) { size_ = static_cast<std::uint8_t>(end - chars_.data()); }
+
+ private:
+  std::array<char, kCapacity> chars_{};
+  std::uint8_t size_ = 0;
+};
+
+inline constexpr std::string_view kNotPresentText = "Not Present";
+
+// "%d". A 32-bit field with its top bit set shows negative, as "%d" of the
+// field always has.
+Text decimalText(std::uint32_t value);
+Text decimalText(std::int32_t value);
+// "%d" followed by the unit ("%d dBm").
+Text wholeText(std::int64_t value, std::string_view unit);
+// "%4.2f" followed by the unit, exactly as printf writes the double.
+Text fixedText(double value, std::string_view unit);
+inline std::string_view trueFalseText(bool value) { return value ? "True" : "False"; }
+
+// The text of the value in the table, or the fallback.
+constexpr std::string_view textFor(std::span<const records::ValueText> table, std::uint32_t value,
+                                   std::string_view fallback) {
+  for (const auto& entry : table) {
+    if (entry.value == value) return entry.text;
+  }
+  return fallback;
+}
+
+// What a raw value shows through its conversion.
+Text conversionText(const records::Conversion& conversion, std::uint32_t raw);
+
+// What a field of a packet shows, in the list entry that begins `entry` bytes in.
+inline Text fieldText(const records::Field& field, const PacketView& packet, std::size_t entry = 0) {
+  return conversionText(field.conversion, field.raw(packet, entry));
+}
+
+}  // namespace corvane

@@ -1,0 +1,158 @@
+#pragma once
+
+// The vocabulary of record layouts. A layout header names every field of one
+// log record once: where it lies (offset from the packet's type byte, so the
+// payload starts at 13), how wide it is, which of its bits hold the value, and
+// how the raw value becomes what the display shows. The section decoders read
+// through these fields and the simulator's encoders write through them, so a
+// layout and its conversions exist in one place.
+//
+// Header-only: the simulator uses it without linking the decoders.
+
+#include <cmath>
+#include <cstddef>
+#include <cstdint>
+#include <span>
+#include <stdexcept>
+#include <string>
+#include <string_view>
+
+#include "LogGenerator/logcode/PacketView.h"
+
+namespace corvane::records {
+
+// One line of a value table: a raw value and its display text.
+struct ValueText {
+  std::uint32_t value;
+  std::string_view text;
+};
+
+// How a raw field value becomes a display value.
+struct Conversion {
+  enum class Kind : std::uint8_t {
+    Decimal,  // "%d" of the value as a signed 32-bit number
+    Fixed,    // "%4.2f<unit>" of x × step + origin, in double precision
+    Whole,    // "%d<unit>" of x × step + origin, taken as a signed 16-bit number
+    Table,    // the text of a value table, or the fallback
+    Flag,     // "True" for any bit set, else "False"
+  };
+
+  Kind kind = Kind::Decimal;
+  double step = 1;
+  double origin = 0;
+  std::string_view unit{};
+  // A raw value that means "not present" rather than a measurement.
+  bool hasNotPresent = false;
+  std::uint32_t notPresent = 0;
+  std::span<const ValueText> table{};
+  std::string_view fallback{};
+
+  bool isNotPresent(std::uint32_t raw) const { return hasNotPresent && raw == notPresent; }
+
+  // The display value as a number: what Fixed and Whole show, the raw value
+  // (signed) otherwise.
+  double value(std::uint32_t raw) const {
+    switch (kind) {
+      case Kind::Fixed: return raw * step + origin;
+      case Kind::Whole: return wholeValue(raw);
+      default: return static_cast<std::int32_t>(raw);
+    }
+  }
+  std::int32_t wholeValue(std::uint32_t raw) const {
+    // Computed wide, then cut to 16 bits as the display has always shown it.
+    const auto wide = static_cast<std::int64_t>(raw) * static_cast<std::int64_t>(step) +
+                      static_cast<std::int64_t>(origin);
+    return static_cast<std::int16_t>(wide);
+  }
+
+  // The raw value that shows as `value`: the inverse that encoders use.
+  // Throws std::logic_error for a value that is no whole number of steps from
+  // the origin, a negative one, or a conversion that has no inverse (a table, a
+  // flag: write those raw).
+  std::uint32_t rawFor(double wanted) const {
+    if (kind == Kind::Table || kind == Kind::Flag) {
+      throw std::logic_error("a table or flag field is written with its raw value");
+    }
+    const double x = kind == Kind::Decimal ? wanted : (wanted - origin) / step;
+    if (x < 0 || x != std::floor(x) || x > 4294967295.0) {
+      throw std::logic_error(std::to_string(wanted) + " is no whole number of " + std::to_string(step) +
+                             " steps from " + std::to_string(origin));
+    }
+    return static_cast<std::uint32_t>(x);
+  }
+};
+
+constexpr Conversion decimal() { return Conversion(); }
+constexpr Conversion fixed(double step, double origin, std::string_view unit) {
+  Conversion c;
+  c.kind = Conversion::Kind::Fixed;
+  c.step = step;
+  c.origin = origin;
+  c.unit = unit;
+  return c;
+}
+constexpr Conversion whole(int step, int origin, std::string_view unit) {
+  Conversion c = fixed(step, origin, unit);
+  c.kind = Conversion::Kind::Whole;
+  return c;
+}
+constexpr Conversion valueTable(std::span<const ValueText> table, std::string_view fallback) {
+  Conversion c;
+  c.kind = Conversion::Kind::Table;
+  c.table = table;
+  c.fallback = fallback;
+  return c;
+}
+constexpr Conversion flag() {
+  Conversion c;
+  c.kind = Conversion::Kind::Flag;
+  return c;
+}
+// The same conversion, with one raw value that shows "Not Present".
+constexpr Conversion orNotPresent(Conversion c, std::uint32_t raw) {
+  c.hasNotPresent = true;
+  c.notPresent = raw;
+  return c;
+}
+
+// A field of a record layout: `bytes` (1, 2 or 4) little-endian bytes at
+// `offset`, of which bits first..last (bit 0 the lowest bit of the first
+// byte) hold the value, shown through `conversion`.
+struct Field {
+  std::size_t offset = 0;
+  unsigned bytes = 1;
+  unsigned first = 0;
+  unsigned last = 8 * bytes - 1;
+  Conversion conversion{};
+
+  // The same field in a list entry that begins `entry` bytes into the record.
+  constexpr Field at(std::size_t entry) const { return {offset + entry, bytes, first, last, conversion}; }
+  constexpr Field bits(unsigned firstBit, unsigned lastBit) const {
+    return {offset, bytes, firstBit, lastBit, conversion};
+  }
+  constexpr Field as(Conversion c) const { return {offset, bytes, first, last, c}; }
+  // One past the field's last byte.
+  constexpr std::size_t end() const { return offset + bytes; }
+
+  // The raw value in a packet, in the entry that begins `entry` bytes in.
+  // Bytes beyond the end of the packet read as zero.
+  std::uint32_t raw(const PacketView& packet, std::size_t entry = 0) const {
+    const std::size_t at = offset + entry;
+    const std::uint32_t whole = bytes == 1 ? packet.u8(at) : bytes == 2 ? packet.le16(at) : packet.le32(at);
+    return PacketView::bits(whole, first, last);
+  }
+  double value(const PacketView& packet, std::size_t entry = 0) const { return conversion.value(raw(packet, entry)); }
+};
+
+constexpr Field u8(std::size_t offset) { return {offset, 1, 0, 7, {}}; }
+constexpr Field le16(std::size_t offset) { return {offset, 2, 0, 15, {}}; }
+constexpr Field le32(std::size_t offset) { return {offset, 4, 0, 31, {}}; }
+
+// A list in a record: fixed-size entries from a first offset, as many as a
+// count field says.
+struct EntryList {
+  std::size_t first;
+  std::size_t entrySize;
+};
+
+}  // namespace corvane::records
