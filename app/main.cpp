@@ -4,14 +4,11 @@
 
 #include <QApplication>
 #include <QMessageBox>
-#include <QSocketNotifier>
 
 #include <csignal>
 #include <cstdio>
 #include <memory>
 #include <string>
-#include <sys/socket.h>
-#include <unistd.h>
 
 #include "app/CorvaneApp.h"
 #include "app/DisplayCheck.h"
@@ -19,20 +16,12 @@
 #include "model/SocketModelEnvironment.h"
 #include "platform/Assertion.h"
 #include "platform/DevicePaths.h"
+#include "platform/SignalEvents.h"
 
 namespace {
 
 constexpr int kExitFailure = 1;
 constexpr int kExitUsage = 2;
-
-// SIGINT and SIGTERM end the event loop through a socket pair, so that the
-// application terminates as it does when its window closes: the status-bar
-// preference goes back and the model tears its ports down.
-int signalPipe[2] = {-1, -1};
-void onSignal(int) {
-  const char c = 1;
-  [[maybe_unused]] const auto n = ::write(signalPipe[1], &c, 1);
-}
 
 }  // namespace
 
@@ -55,14 +44,6 @@ int main(int argc, char** argv) {
     return kExitUsage;
   }
 
-  if (::socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, signalPipe) != 0) {
-    std::perror("corvane: socketpair");
-    return kExitFailure;
-  }
-  QSocketNotifier signalNotifier(signalPipe[0], QSocketNotifier::Read);
-  QObject::connect(&signalNotifier, &QSocketNotifier::activated, &application, [] { QCoreApplication::quit(); });
-  std::signal(SIGINT, onSignal);
-  std::signal(SIGTERM, onSignal);
   std::signal(SIGPIPE, SIG_IGN);
 
   std::string error;
@@ -71,6 +52,15 @@ int main(int argc, char** argv) {
     std::fprintf(stderr, "corvane: %s\n", error.c_str());
     QMessageBox::critical(nullptr, QStringLiteral("Corvane"),
                           QStringLiteral("Corvane cannot reach the telephony service: %1").arg(QString::fromStdString(error)));
+    return kExitFailure;
+  }
+  // SIGINT and SIGTERM end the event loop, so that the application terminates
+  // as it does when its window closes: the status-bar preference goes back and
+  // the model tears its ports down.
+  const std::unique_ptr<SignalEvents> signalEvents = SignalEvents::watch(
+      platform->runLoop(), SignalEvents::terminationSignals(), [](int) { QCoreApplication::quit(); }, error);
+  if (!signalEvents) {
+    std::fprintf(stderr, "corvane: %s\n", error.c_str());
     return kExitFailure;
   }
 

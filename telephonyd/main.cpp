@@ -1,8 +1,5 @@
 // corvane-telephonyd: the telephony service that Corvane asks for log channels.
 
-#include <sys/signalfd.h>
-#include <unistd.h>
-
 #include <QCoreApplication>
 #include <chrono>
 #include <csignal>
@@ -13,6 +10,7 @@
 #include "platform/LogChannelTechnology.h"
 #include "platform/QtRunLoop.h"
 #include "platform/RuntimeDirectory.h"
+#include "platform/SignalEvents.h"
 #include "platform/SocketMessagePort.h"
 #include "platform/SocketTelephonyClient.h"
 #include "platform/Version.h"
@@ -73,16 +71,6 @@ int main(int argc, char** argv) {
   const RuntimeDirectoryResult runtime = prepareRuntimeDirectory();
   if (!runtime) return fail(runtime.error);
 
-  // The termination signals arrive as readable data on the run loop, so that
-  // shutdown runs as ordinary loop work and can remove the socket files. They
-  // are blocked before Qt starts any thread, so that no thread takes them.
-  sigset_t termination;
-  sigemptyset(&termination);
-  sigaddset(&termination, SIGTERM);
-  sigaddset(&termination, SIGINT);
-  pthread_sigmask(SIG_BLOCK, &termination, nullptr);
-  const int signalFd = ::signalfd(-1, &termination, SFD_NONBLOCK | SFD_CLOEXEC);
-  if (signalFd < 0) return fail("cannot watch for termination signals");
   // Writes to a vanished client must fail with EPIPE, never end the service.
   std::signal(SIGPIPE, SIG_IGN);
 
@@ -90,6 +78,16 @@ int main(int argc, char** argv) {
   int qtArgc = 1;
   QCoreApplication application(qtArgc, argv);
   QtRunLoop runLoop;
+  // The termination signals are caught before the service opens its sockets:
+  // they end the loop, and shutdown runs as ordinary work that removes them.
+  const std::unique_ptr<SignalEvents> signalEvents = SignalEvents::watch(
+      runLoop, SignalEvents::terminationSignals(),
+      [](int signal) {
+        log::printf(log::kNotice, "corvane-telephonyd stopping on signal %d", signal);
+        QCoreApplication::quit();
+      },
+      error);
+  if (!signalEvents) return fail(error);
   SocketPortSystem ports(runtime.path);
   TelephonyService service(ports, runLoop, std::move(source), {options.rate, options.packetLimit});
   if (!service.start(error)) {
@@ -100,20 +98,11 @@ int main(int argc, char** argv) {
     return fail(error);
   }
 
-  runLoop.watchReadable(signalFd, [&] {
-    signalfd_siginfo info{};
-    if (::read(signalFd, &info, sizeof info) != static_cast<ssize_t>(sizeof info)) return;
-    log::printf(log::kNotice, "corvane-telephonyd stopping on signal %u", info.ssi_signo);
-    service.stop();
-    QCoreApplication::quit();
-  });
-
   const std::string pace = options.rate > 0 ? log::format("%g packets/s", options.rate) : "full speed";
   log::printf(log::kNotice, "corvane-telephonyd %s serving %s: technology %s, seed %llu, %s", kVersion,
               ports.socketPath(std::string(kTelephonyServicePortName)).c_str(), options.technology.c_str(),
               static_cast<unsigned long long>(options.seed), pace.c_str());
   const int status = QCoreApplication::exec();
   service.stop();
-  ::close(signalFd);
   return status;
 }

@@ -5,15 +5,12 @@
 #include <getopt.h>
 
 #include <QCoreApplication>
-#include <QSocketNotifier>
 
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
 #include <memory>
 #include <string>
-#include <sys/socket.h>
-#include <unistd.h>
 
 #include "CommandLine.h"
 #include "LogGenerator/logcode/ClassIndex.h"
@@ -23,6 +20,7 @@
 #include "platform/Assertion.h"
 #include "platform/DateText.h"
 #include "platform/Log.h"
+#include "platform/SignalEvents.h"
 #include "platform/Version.h"
 
 namespace {
@@ -57,14 +55,6 @@ void printHelp() {
 
 int usageError(const std::string& message) {
   return corvane::tools::usageError("corvane-monitor", kUsage, message);
-}
-
-// SIGINT and SIGTERM end the event loop through a socket pair, so that the
-// model tears its ports down before the program ends.
-int signalPipe[2] = {-1, -1};
-void onSignal(int) {
-  const char c = 1;
-  [[maybe_unused]] const auto n = ::write(signalPipe[1], &c, 1);
 }
 
 class Monitor final : public corvane::CorvaneModelDelegate {
@@ -143,14 +133,14 @@ int main(int argc, char** argv) {
     tools::copyLogToStandardError();
   }
 
-  if (::socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, signalPipe) != 0) {
-    std::perror("corvane-monitor: socketpair");
+  // SIGINT and SIGTERM end the event loop, so that the model tears its ports
+  // down before the program ends.
+  const std::unique_ptr<SignalEvents> signalEvents = SignalEvents::watch(
+      platform->runLoop(), SignalEvents::terminationSignals(), [](int) { QCoreApplication::quit(); }, error);
+  if (!signalEvents) {
+    std::fprintf(stderr, "corvane-monitor: %s\n", error.c_str());
     return kExitFailure;
   }
-  QSocketNotifier signalNotifier(signalPipe[0], QSocketNotifier::Read);
-  QObject::connect(&signalNotifier, &QSocketNotifier::activated, &app, [] { QCoreApplication::quit(); });
-  std::signal(SIGINT, onSignal);
-  std::signal(SIGTERM, onSignal);
   std::signal(SIGPIPE, SIG_IGN);
 
   Monitor monitor(*treeFormat, updates);
