@@ -21,10 +21,10 @@ LogCode_0xFF0000::LogCode_0xFF0000(std::span<const std::uint8_t> packet) {
     log::printf(log::kError, "SIM File dictionary data could not be constructed");
     throw UnknownDataException();
   }
-  _dictionary = *parsed->asDictionary();
+  dictionary_ = *parsed->asDictionary();
 }
 
-Value LogCode_0xFF0000::valueForKey(std::string_view key) const { return _dictionary.get(key); }
+Value LogCode_0xFF0000::valueForKey(std::string_view key) const { return dictionary_.get(key); }
 
 CellInfoArray::CellInfoArray(std::span<const std::uint8_t> packet) {
   auto parsed = parsePayload(packet);
@@ -32,7 +32,7 @@ CellInfoArray::CellInfoArray(std::span<const std::uint8_t> packet) {
     log::printf(log::kError, "Cell Info Array data could not be constructed");
     return;
   }
-  if (const Array* a = parsed->asArray()) _array = *a;
+  if (const Array* a = parsed->asArray()) array_ = *a;
 }
 
 std::optional<std::int32_t> CellInfoArray::integerValue(const Dictionary& cell, std::string_view key) {
@@ -48,7 +48,7 @@ std::optional<std::int32_t> CellInfoArray::integerValue(const Dictionary& cell, 
 LogCode_0xFF0002::LogCode_0xFF0002(std::span<const std::uint8_t> packet) {
   auto parsed = parsePayload(packet);
   if (parsed) {
-    if (const Array* a = parsed->asArray()) _array = *a;
+    if (const Array* a = parsed->asArray()) array_ = *a;
   }
 }
 

@@ -33,7 +33,7 @@ class LogCode_0xFF0000 {
   Value valueForKey(std::string_view key) const;
 
  private:
-  Dictionary _dictionary;
+  Dictionary dictionary_;
 };
 
 // The cell-monitor cell list, held for the length of one decode. A payload that
@@ -43,14 +43,14 @@ class LogCode_0xFF0000 {
 class CellInfoArray {
  public:
   explicit CellInfoArray(std::span<const std::uint8_t> packet);
-  const Array* array() const { return _array ? &*_array : nullptr; }
+  const Array* array() const { return array_ ? &*array_ : nullptr; }
 
   // A number of a cell dictionary as a signed 32-bit integer; nothing when the
   // key is missing or its value is not a number.
   static std::optional<std::int32_t> integerValue(const Dictionary& cell, std::string_view key);
 
  private:
-  std::optional<Array> _array;
+  std::optional<Array> array_;
 };
 
 // The PDP context list: the payload when it parses to an array, else nothing,
@@ -58,10 +58,10 @@ class CellInfoArray {
 class LogCode_0xFF0002 {
  public:
   explicit LogCode_0xFF0002(std::span<const std::uint8_t> packet);
-  const Array* array() const { return _array ? &*_array : nullptr; }
+  const Array* array() const { return array_ ? &*array_ : nullptr; }
 
  private:
-  std::optional<Array> _array;
+  std::optional<Array> array_;
 };
 
 }  // namespace corvane
