@@ -74,7 +74,9 @@ std::shared_ptr<Base> Base::initWithDict(const SectionDescriptor& descriptor, Cl
 }
 
 std::string Base::getSectionName() const {
-  if (!descriptor_) raiseAssertionFailure("getSectionName: a section without a table row must name itself", __FILE__, __LINE__);
+  if (!descriptor_) {
+    raiseAssertionFailure("getSectionName: a section without a table row must name itself", __FILE__, __LINE__);
+  }
   return std::string(descriptor_->name);
 }
 

@@ -4,6 +4,7 @@
 
 #include "LogGenerator/logcode/ArrayLock.h"
 #include "logcode/TestSections.h"
+#include "platform/Assertion.h"
 #include "platform/Log.h"
 #include "support/Values.h"
 
@@ -39,6 +40,31 @@ TEST(Base, SectionsSharingACodeAreCalledInCreationOrder) {
   ASSERT_EQ(journal.size(), 2u);
   EXPECT_EQ(journal[0].section, "First");
   EXPECT_EQ(journal[1].section, "Second");
+}
+
+// A section that neither comes from a table row nor names itself.
+class NamelessSection final : public Base {
+ public:
+  void updateWithData(std::span<const std::uint8_t>, std::uint32_t) override {}
+};
+
+TEST(Base, ASectionWithoutATableRowOrItsOwnNameIsAProgrammingError) {
+  NamelessSection section;
+  EXPECT_THROW(section.getSectionName(), AssertionFailure);
+  EXPECT_THROW(section.getLogCodeArray(), AssertionFailure);
+}
+
+TEST(Base, ASectionMadeFromATableRowTakesItsNameAndCodesFromTheRow) {
+  static constexpr SectionDescriptor kRow =
+      section<NamelessSection>("objNameless", "Nameless", {0xB0C2, 0xFF0001}, SectionContainer::Rows);
+  ClassDictionary classDict;
+  CodeDictionary codeDict;
+  const auto made = Base::initWithDict(kRow, classDict, codeDict);
+  EXPECT_EQ(made->getSectionName(), "Nameless");
+  EXPECT_EQ(made->getLogCodeArray(), (std::vector<std::uint32_t>{0xB0C2, 0xFF0001}));
+  EXPECT_EQ(classDict.at("Nameless"), made);
+  ASSERT_NE(codeDict.find("16711681"), nullptr);
+  EXPECT_EQ(codeDict.find("16711681")->front(), made);
 }
 
 TEST(Base, ACodeListedTwiceSubscribesTwice) {

@@ -63,6 +63,13 @@ void collectBadKeys(const Value& node, std::vector<std::string>& bad) {
   }
 }
 
+}  // namespace
+
+// Failure messages name the technology rather than dump the row's bytes.
+void PrintTo(const LogCodeTechnology& technology, std::ostream* os) { *os << technology.technology; }
+
+namespace {
+
 class SectionTables : public ::testing::TestWithParam<LogCodeTechnology> {
  protected:
   SectionTables() { ClassIndex::setTeardownStream(nullptr); }
