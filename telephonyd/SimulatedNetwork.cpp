@@ -20,6 +20,26 @@ constexpr int kImsToggleOneIn = 60;    // chance per step that the IMS context c
 constexpr int kUmtsFallbackLevel = -105;
 constexpr int kUmtsReturnLevel = -95;
 
+// The LTE cell search finds a cell on the serving carrier every 4 to 25 steps,
+// unless two found cells are still only detected or five are about at once.
+constexpr int kDetectionEveryLeast = 4;
+constexpr int kDetectionEveryMost = 25;
+constexpr std::size_t kMostDetected = 2;
+constexpr std::size_t kMostFound = 5;
+// A found cell is only detected for 3 to 40 steps; then one in two is measured,
+// for 15 to 90 steps, and the others are lost.
+constexpr int kDetectedLeast = 3;
+constexpr int kDetectedMost = 40;
+constexpr int kMeasuredOneIn = 2;
+constexpr int kMeasuredLeast = 15;
+constexpr int kMeasuredMost = 90;
+// Found 8 to 20 dB below the serving cell (in 2 dB steps), and kept at least
+// 4 dB below it; never below the floor of the LTE range, so a serving cell at
+// that floor may be matched, but never passed.
+constexpr int kFoundBelowServingLeast = 8;
+constexpr int kFoundBelowServingMost = 20;
+constexpr int kFoundBelowServing = 4;
+
 // The LTE bands of the scenario. On each, the uplink E-ARFCN lies 18000 above the downlink one.
 struct LteBand {
   int band;
@@ -142,7 +162,8 @@ std::string number(long long value) { return std::to_string(value); }
 
 }  // namespace
 
-SimulatedNetwork::SimulatedNetwork(std::string_view technology, std::uint64_t seed) : random_(seed), radio_(~seed) {
+SimulatedNetwork::SimulatedNetwork(std::string_view technology, std::uint64_t seed)
+    : random_(seed), radio_(~seed), detection_(seed ^ 0x9E3779B97F4A7C15u) {
   const int areaCode = random_.uniform(0x1000, 0x7FFF);
   if (technology == kLogChannelTechnologyQuendraGSM) {
     addCells(Access::UMTS, 5, areaCode);
@@ -156,17 +177,19 @@ SimulatedNetwork::SimulatedNetwork(std::string_view technology, std::uint64_t se
       const LteBand& band = lteBand(cell.band);
       cell.uplinkChannel = cell.channel + band.uplinkOffset;
       cell.resourceBlocks = band.resourceBlocks;
-      measureLteCell(cell);
+      measureLteCell(cell, radio_);
       cell.averageRsrp = cell.rsrp;
       cell.averageRsrq = cell.rsrq;
     }
     // A UMTS band 1 cell and a GSM 1800 cell.
     interRatNeighbours_.push_back({Access::UMTS, radio_.uniform(10562, 10838), radio_.uniform(0, 511), 1});
     interRatNeighbours_.push_back({Access::GSM, radio_.uniform(512, 885), radio_.uniform(0, 63), 0});
+    nextDetection_ = static_cast<std::uint64_t>(detection_.uniform(kDetectionEveryLeast, kDetectionEveryMost));
   } else {
     throw std::invalid_argument("no simulated network for technology " + std::string(technology));
   }
   cells_[serving_].serving = true;
+  plannedCells_ = cells_.size();
 
   imsi_ = "00101" + digitString(random_, 10);
   iccid_ = "8900101" + digitString(random_, 11);
@@ -285,20 +308,96 @@ void SimulatedNetwork::drift(Cell& cell) {
     cell.quality = std::clamp((cell.level + 60) / 4 - 2 + random_.uniform(-1, 1), -24, 0);
   }
   if (cell.access == Access::LTE) {
-    measureLteCell(cell);
+    measureLteCell(cell, radio_);
     cell.averageRsrp = filtered(cell.averageRsrp, cell.rsrp);
     cell.averageRsrq = filtered(cell.averageRsrq, cell.rsrq);
   }
   cell.measured = cell.serving || !random_.oneIn(kUnmeasuredOneIn);
 }
 
-void SimulatedNetwork::measureLteCell(Cell& cell) {
+void SimulatedNetwork::measureLteCell(Cell& cell, SeededRandom& noise) {
   // Levels are even, so both land on half-dB steps.
-  const double rsrp = cell.level - rsrpBelowRssi(cell.resourceBlocks) + 0.5 * radio_.uniform(-2, 2);
+  const double rsrp = cell.level - rsrpBelowRssi(cell.resourceBlocks) + 0.5 * noise.uniform(-2, 2);
   // From -3 dB at -40 dBm down to -18 dB at -100 dBm, as Ec/N0 follows RSCP.
-  const double rsrq = -3 + 0.25 * (cell.level + 40) + 0.5 * radio_.uniform(-1, 1);
+  const double rsrq = -3 + 0.25 * (cell.level + 40) + 0.5 * noise.uniform(-1, 1);
   cell.rsrp = std::clamp(rsrp, kLowestRsrp, kHighestRsrp);
   cell.rsrq = std::clamp(rsrq, kLowestRsrq, kHighestRsrq);
+}
+
+void SimulatedNetwork::stepDetectedCells() {
+  const Cell& serving = cells_[serving_];
+  const int lowest = levelRange(Access::LTE).low;
+  // Weak cells: they stay clearly below the serving cell, so they are never the
+  // strongest and never take over.
+  auto belowServing = [&](int level) { return std::max(lowest, std::min(level, serving.level - kFoundBelowServing)); };
+
+  for (std::size_t i = 0; i < foundCells_.size();) {
+    FoundCell& found = foundCells_[i];
+    Cell& cell = cells_[plannedCells_ + i];
+    const bool wasDetected = found.detectedSteps > 0;
+    const bool gone = wasDetected ? --found.detectedSteps == 0 && !found.toBeMeasured  // lost
+                                  : --found.measuredSteps == 0;                      // faded out
+    if (gone) {
+      cells_.erase(cells_.begin() + static_cast<std::ptrdiff_t>(plannedCells_ + i));
+      foundCells_.erase(foundCells_.begin() + static_cast<std::ptrdiff_t>(i));
+      continue;
+    }
+    cell.level = belowServing(cell.level + 2 * detection_.uniform(-1, 1));
+    measureLteCell(cell, detection_);
+    if (found.detectedSteps > 0 || wasDetected) {
+      // Nothing filtered yet: the filter starts with the first measurement.
+      cell.averageRsrp = cell.rsrp;
+      cell.averageRsrq = cell.rsrq;
+      cell.measured = found.detectedSteps == 0;
+    } else {
+      cell.averageRsrp = filtered(cell.averageRsrp, cell.rsrp);
+      cell.averageRsrq = filtered(cell.averageRsrq, cell.rsrq);
+      // Now and then unmeasured, like every neighbour.
+      cell.measured = !detection_.oneIn(kUnmeasuredOneIn);
+    }
+    ++i;
+  }
+
+  std::size_t detected = 0;
+  for (const FoundCell& found : foundCells_) detected += found.detectedSteps > 0 ? 1 : 0;
+  if (steps_ >= nextDetection_ && detected < kMostDetected && foundCells_.size() < kMostFound) {
+    detectCell();
+    nextDetection_ = steps_ + static_cast<std::uint64_t>(detection_.uniform(kDetectionEveryLeast, kDetectionEveryMost));
+  }
+}
+
+void SimulatedNetwork::detectCell() {
+  const Cell& serving = cells_[serving_];
+  Cell cell;
+  cell.access = Access::LTE;
+  // In the registered area (that of the first serving cell) or across its border.
+  cell.areaCode = cells_.front().areaCode + (detection_.oneIn(4) ? detection_.uniform(1, 9) : 0);
+  cell.cellId = detection_.uniform(1, 0xFFFFF) << 8 | detection_.uniform(1, 3);
+  cell.channel = serving.channel;
+  cell.band = serving.band;
+  const LteBand& band = lteBand(cell.band);
+  cell.uplinkChannel = cell.channel + band.uplinkOffset;
+  cell.resourceBlocks = band.resourceBlocks;
+  // A physical cell id that no cell about uses.
+  for (;;) {
+    cell.code = detection_.uniform(0, 503);
+    const bool taken = std::any_of(cells_.begin(), cells_.end(), [&](const Cell& c) { return c.code == cell.code; });
+    if (!taken) break;
+  }
+  const int lowest = levelRange(Access::LTE).low;
+  cell.level = std::max(lowest, serving.level - 2 * detection_.uniform(kFoundBelowServingLeast / 2,
+                                                                         kFoundBelowServingMost / 2));
+  cell.measured = false;
+  measureLteCell(cell, detection_);
+  cell.averageRsrp = cell.rsrp;
+  cell.averageRsrq = cell.rsrq;
+
+  FoundCell found;
+  found.detectedSteps = detection_.uniform(kDetectedLeast, kDetectedMost);
+  found.toBeMeasured = detection_.oneIn(kMeasuredOneIn);
+  found.measuredSteps = detection_.uniform(kMeasuredLeast, kMeasuredMost);
+  cells_.push_back(cell);
+  foundCells_.push_back(found);
 }
 
 std::size_t SimulatedNetwork::strongest(Access access) const {
@@ -329,7 +428,8 @@ void SimulatedNetwork::changeServingCell(std::size_t to) {
 
 void SimulatedNetwork::step() {
   ++steps_;
-  for (Cell& cell : cells_) drift(cell);
+  for (std::size_t i = 0; i < plannedCells_; ++i) drift(cells_[i]);
+  if (cells_[serving_].access == Access::LTE) stepDetectedCells();
   const Cell& serving = cells_[serving_];
   for (Cell& cell : cells_) {
     const bool clearlyStronger = !cell.serving && cell.measured && cell.access == serving.access &&

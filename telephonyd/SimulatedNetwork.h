@@ -28,6 +28,13 @@
 // LTE network also names a UTRAN and a GERAN cell for reselection, which the
 // phone does not measure while on LTE.
 //
+// Beside the planned cells, the LTE phone's cell search now and then finds a
+// weak cell on the serving carrier. Such a cell is detected first (the phone
+// knows its physical cell id, nothing measured yet) for some seconds; then it
+// is either measured, an ordinary neighbour until it fades out again, or lost.
+// These cells stay below the serving cell, so they never take over; the cell
+// list holds them as it holds every neighbour, unmeasured while only detected.
+//
 // Everything depends only on the technology, the seed and the number of steps.
 
 #include <chrono>
@@ -109,7 +116,9 @@ class SimulatedNetwork {
  private:
   void addCells(Access access, int count, int areaCode);
   void drift(Cell& cell);
-  void measureLteCell(Cell& cell);
+  void measureLteCell(Cell& cell, SeededRandom& noise);
+  void stepDetectedCells();
+  void detectCell();
   void changeServingCell(std::size_t to);
   std::size_t strongest(Access access) const;
   Dictionary cellFields(const Cell& cell) const;
@@ -119,7 +128,20 @@ class SimulatedNetwork {
   // their own: the levels, cell changes, SIM and PDP contexts that a seed gives
   // do not depend on them.
   SeededRandom radio_;
+  // So do the LTE cells that the phone finds beside the planned ones: their
+  // coming and going, their values and their measurement noise.
+  SeededRandom detection_;
   std::vector<Cell> cells_;
+  // The planned cells come first in cells_; behind them the found ones, each
+  // with its place in its life in foundCells_ (the same order).
+  struct FoundCell {
+    int detectedSteps = 0;  // left before it is measured or lost
+    bool toBeMeasured = false;
+    int measuredSteps = 0;  // left, once measured, before it fades out
+  };
+  std::size_t plannedCells_ = 0;
+  std::vector<FoundCell> foundCells_;
+  std::uint64_t nextDetection_ = 0;  // the step at which the cell search finds the next cell
   std::vector<InterRatNeighbour> interRatNeighbours_;
   std::size_t serving_ = 0;
   std::uint64_t steps_ = 0;

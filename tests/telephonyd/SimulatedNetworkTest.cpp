@@ -3,8 +3,14 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
+#include <algorithm>
 #include <cstdio>
+#include <map>
+#include <optional>
 #include <set>
+#include <string>
+#include <utility>
+#include <vector>
 #include <stdexcept>
 
 #include "platform/CellMonitor.h"
@@ -363,6 +369,229 @@ TEST(SimulatedNetworkTest, OnlyTheLteNetworkNamesAUtranAndAGeranCellForReselecti
       EXPECT_EQ(cell.resourceBlocks, 0) << technology;
       EXPECT_EQ(cell.rsrp, 0) << technology;
     }
+  }
+}
+
+// --- LTE cells that the cell search finds beside the planned ones ---
+
+// One found cell's life as the network showed it step by step.
+struct FoundLife {
+  int code = 0;
+  int cellId = 0;
+  int channel = 0;
+  int servingChannelWhenFound = 0;
+  int foundAt = 0;           // step
+  std::string measured;      // per step: 'D' only detected, 'M' measured
+  std::optional<int> goneAt; // step
+  int firstDetectedSteps() const {
+    const auto end = measured.find('M');
+    return static_cast<int>(end == std::string::npos ? measured.size() : end);
+  }
+  bool wasMeasured() const { return measured.find('M') != std::string::npos; }
+};
+
+// The planned cells of an LTE network: those there from the start, by PCI and cell identity.
+std::set<std::pair<int, int>> plannedLteCells(std::uint64_t seed) {
+  const SimulatedNetwork network(kLogChannelTechnologyQuendraLTE, seed);
+  std::set<std::pair<int, int>> planned;
+  for (const auto& cell : network.cells()) planned.insert({cell.code, cell.cellId});
+  return planned;
+}
+
+// Steps an LTE network and follows every cell that was not there at the start.
+// `each` sees the network after every step.
+template <typename Each>
+std::vector<FoundLife> followFoundCells(std::uint64_t seed, int steps, Each each) {
+  SimulatedNetwork network(kLogChannelTechnologyQuendraLTE, seed);
+  const auto planned = plannedLteCells(seed);
+  std::vector<FoundLife> lives;
+  std::map<std::pair<int, int>, std::size_t> present;  // a found cell and its life
+  for (int step = 1; step <= steps; ++step) {
+    const int servingChannel = network.servingCell().channel;  // the carrier searched in this step
+    network.step();
+    std::map<std::pair<int, int>, std::size_t> now;
+    for (const auto& cell : network.cells()) {
+      const std::pair<int, int> key{cell.code, cell.cellId};
+      if (planned.count(key)) continue;
+      auto it = present.find(key);
+      if (it == present.end()) {
+        lives.push_back({cell.code, cell.cellId, cell.channel, servingChannel, step, "", {}});
+        it = present.emplace(key, lives.size() - 1).first;
+      }
+      lives[it->second].measured += cell.measured ? 'M' : 'D';
+      now.insert(*it);
+    }
+    for (const auto& [key, life] : present) {
+      if (!now.count(key)) lives[life].goneAt = step;
+    }
+    present = std::move(now);
+    each(network, step);
+  }
+  return lives;
+}
+
+TEST(SimulatedNetworkTest, LteCellSearchFindsCellsOnTheServingCarrierThatStayDetectedAWhileThenAreMeasuredOrLost) {
+  for (std::uint64_t seed = 1; seed <= 12; ++seed) {
+    SCOPED_TRACE(seed);
+    constexpr int kSteps = 600;
+    std::vector<int> detectedCounts;  // found cells only detected, on the serving carrier, per step
+    const auto planned = plannedLteCells(seed);
+    const auto lives = followFoundCells(seed, kSteps, [&](const SimulatedNetwork& network, int) {
+      int detected = 0;
+      for (const auto& cell : network.cells()) {
+        if (!planned.count({cell.code, cell.cellId}) && !cell.measured &&
+            cell.channel == network.servingCell().channel) {
+          ++detected;
+        }
+      }
+      detectedCounts.push_back(detected);
+    });
+
+    ASSERT_FALSE(lives.empty());
+    EXPECT_LE(lives.front().foundAt, 60) << "a cell is found in the first minute";
+    int measured = 0, lost = 0;
+    for (const FoundLife& life : lives) {
+      SCOPED_TRACE("PCI " + std::to_string(life.code) + " found at " + std::to_string(life.foundAt));
+      EXPECT_EQ(life.channel, life.servingChannelWhenFound) << "found on the serving carrier";
+      EXPECT_EQ(life.measured.front(), 'D') << "detected before it is measured";
+      if (!life.goneAt && !life.wasMeasured()) continue;  // still only detected at the end
+      // Detected for a few seconds to some tens of seconds.
+      EXPECT_GE(life.firstDetectedSteps(), 3);
+      EXPECT_LE(life.firstDetectedSteps(), 40);
+      if (life.wasMeasured()) {
+        ++measured;
+        if (life.goneAt) {
+          EXPECT_GE(*life.goneAt - life.foundAt, life.firstDetectedSteps() + 15) << "measured a while";
+        }
+      } else {
+        ++lost;
+      }
+    }
+    EXPECT_GE(measured, 3);
+    EXPECT_GE(lost, 3);
+
+    // Found cells come and go again and again: the number only detected changes
+    // often, and after the first no minute passes without one.
+    int changes = 0;
+    for (std::size_t i = 1; i < detectedCounts.size(); ++i) changes += detectedCounts[i] != detectedCounts[i - 1];
+    EXPECT_GE(changes, 20);
+    int quiet = 0, longestQuiet = 0;
+    for (std::size_t i = static_cast<std::size_t>(lives.front().foundAt); i < detectedCounts.size(); ++i) {
+      quiet = detectedCounts[i] > 0 ? 0 : quiet + 1;
+      longestQuiet = std::max(longestQuiet, quiet);
+    }
+    EXPECT_LT(longestQuiet, 60);
+    EXPECT_GT(std::count_if(detectedCounts.begin(), detectedCounts.end(), [](int n) { return n > 0; }), kSteps / 2);
+  }
+}
+
+TEST(SimulatedNetworkTest, EveryLteCellHasAPhysicalCellIdOfItsOwnOnItsCarrierAsCellsComeAndGo) {
+  for (std::uint64_t seed = 1; seed <= 12; ++seed) {
+    SCOPED_TRACE(seed);
+    std::size_t mostCells = 0;
+    followFoundCells(seed, 600, [&](const SimulatedNetwork& network, int step) {
+      std::set<std::pair<int, int>> codes;  // channel, PCI
+      for (const auto& cell : network.cells()) {
+        EXPECT_TRUE(codes.insert({cell.channel, cell.code}).second)
+            << "PCI " << cell.code << " twice on E-ARFCN " << cell.channel << " at step " << step;
+        EXPECT_GE(cell.code, 0);
+        EXPECT_LE(cell.code, 503);
+      }
+      mostCells = std::max(mostCells, network.cells().size());
+    });
+    EXPECT_GT(mostCells, 6u) << "cells were found";
+  }
+}
+
+TEST(SimulatedNetworkTest, FoundLteCellsAreWeakerThanTheServingCellAndNeverTakeOver) {
+  for (std::uint64_t seed = 1; seed <= 12; ++seed) {
+    SCOPED_TRACE(seed);
+    const auto planned = plannedLteCells(seed);
+    std::set<std::pair<int, int>> measuredBefore;  // found cells measured at some step so far
+    int seen = 0;
+    followFoundCells(seed, 900, [&](const SimulatedNetwork& network, int step) {
+      const auto& serving = network.servingCell();
+      EXPECT_TRUE(planned.count({serving.code, serving.cellId})) << "step " << step;
+      for (const auto& cell : network.cells()) {
+        const std::pair<int, int> key{cell.code, cell.cellId};
+        if (planned.count(key)) continue;
+        SCOPED_TRACE("PCI " + std::to_string(cell.code) + " at step " + std::to_string(step));
+        ++seen;
+        EXPECT_FALSE(cell.serving);
+        EXPECT_EQ(cell.access, Access::LTE);
+        EXPECT_LE(cell.level, serving.level);
+        EXPECT_GE(cell.level, -100);
+        EXPECT_EQ(cell.level % 2, 0);
+        EXPECT_TRUE((cell.band == 3 && cell.channel >= 1200 && cell.channel <= 1949) ||
+                    (cell.band == 7 && cell.channel >= 2750 && cell.channel <= 3449) ||
+                    (cell.band == 20 && cell.channel >= 6150 && cell.channel <= 6449))
+            << cell.band << " " << cell.channel;
+        EXPECT_EQ(cell.uplinkChannel, cell.channel + 18000);
+        EXPECT_EQ(cell.resourceBlocks, cell.band == 20 ? 50 : 100);
+        EXPECT_LE(cell.cellId, 0xFFFFFFF);
+        for (double rsrp : {cell.rsrp, cell.averageRsrp}) {
+          EXPECT_GE(rsrp, -125);
+          EXPECT_LE(rsrp, -70);
+        }
+        for (double rsrq : {cell.rsrq, cell.averageRsrq}) {
+          EXPECT_GE(rsrq, -20);
+          EXPECT_LE(rsrq, -3);
+        }
+        if (cell.measured && measuredBefore.insert(key).second) {
+          // Measured for the first time: the filter starts with this measurement.
+          EXPECT_EQ(cell.averageRsrp, cell.rsrp);
+          EXPECT_EQ(cell.averageRsrq, cell.rsrq);
+        }
+      }
+    });
+    EXPECT_GT(seen, 0);
+    EXPECT_FALSE(measuredBefore.empty());
+  }
+}
+
+TEST(SimulatedNetworkTest, TheCellListHoldsFoundLteCellsAsItHoldsEveryNeighbourUnmeasuredWhileOnlyDetected) {
+  const auto planned = plannedLteCells(7);
+  int detectedListed = 0;
+  followFoundCells(7, 300, [&](const SimulatedNetwork& network, int) {
+    const auto listed = cellsOf(network);
+    ASSERT_EQ(listed.size(), network.cells().size());
+    for (const auto& cell : network.cells()) {
+      if (planned.count({cell.code, cell.cellId})) continue;
+      const auto entry = std::find_if(listed.begin(), listed.end(), [&](const Dictionary& d) {
+        return integer(d, CellMonitorPID) == cell.code && integer(d, CellMonitorCellId) == cell.cellId;
+      });
+      ASSERT_NE(entry, listed.end()) << "PCI " << cell.code;
+      expectCellKeys(*entry);
+      EXPECT_EQ(text(*entry, CellMonitorCellType), CellMonitorCellTypeNeighbor);
+      EXPECT_EQ(integer(*entry, CellMonitorUARFCN), cell.channel);
+      EXPECT_EQ(integer(*entry, CellMonitorRSSI), cell.measured ? cell.level / 2 : kCellMonitorNotMeasured);
+      detectedListed += cell.measured ? 0 : 1;
+    }
+  });
+  EXPECT_GT(detectedListed, 0);
+}
+
+TEST(SimulatedNetworkTest, SameSeedFindsTheSameLteCellsAndAnotherSeedOthers) {
+  auto story = [](std::uint64_t seed) {
+    std::string text;
+    const auto lives = followFoundCells(seed, 600, [&](const SimulatedNetwork& network, int step) {
+      for (const auto& cell : network.cells()) {
+        text += std::to_string(step) + ":" + std::to_string(cell.code) + "/" + std::to_string(cell.level) + "/" +
+                std::to_string(cell.rsrp) + (cell.measured ? "M " : "D ");
+      }
+      text += "\n";
+    });
+    for (const FoundLife& life : lives) {
+      text += std::to_string(life.code) + " " + std::to_string(life.foundAt) + " " + life.measured + " " +
+              (life.goneAt ? std::to_string(*life.goneAt) : "-") + "\n";
+    }
+    return std::pair{lives.size(), text};
+  };
+  for (std::uint64_t seed : {1u, 2u, 3u}) {
+    const auto a = story(seed);
+    EXPECT_GT(a.first, 10u);
+    EXPECT_EQ(a.second, story(seed).second) << "seed " << seed;
+    EXPECT_NE(a.second, story(seed + 10).second) << "seed " << seed;
   }
 }
 
