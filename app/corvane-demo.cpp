@@ -5,7 +5,6 @@
 // directory) when the application quits, or when the demo is interrupted.
 
 #include <fcntl.h>
-#include <getopt.h>
 #include <spawn.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
@@ -18,15 +17,16 @@
 #include <cstdlib>
 #include <cstring>
 #include <filesystem>
+#include <optional>
 #include <string>
+#include <string_view>
 #include <system_error>
 #include <thread>
 #include <vector>
 
-#include "CommandLine.h"
 #include "app/DisplayCheck.h"
+#include "platform/CommandLine.h"
 #include "platform/DevicePaths.h"
-#include "platform/Version.h"
 
 extern char** environ;
 
@@ -39,32 +39,26 @@ constexpr int kExitFailure = 1;
 constexpr auto kServiceStartLimit = 5s;
 constexpr auto kServiceStopLimit = 3s;
 
-constexpr const char* kUsage =
-    "Usage: corvane-demo [--technology NAME] [--seed N] [--device-root DIR]\n";
-
-void printHelp() {
-  std::printf(
-      "%s"
-      "\n"
-      "Starts the telephony service with its built-in simulator and the Corvane\n"
-      "application connected to it. Quitting the application, Ctrl-C or SIGTERM\n"
-      "stop both.\n"
-      "\n"
-      "Options:\n"
-      "  -t, --technology NAME  the simulated baseband (default: IFX)\n"
-      "  -s, --seed N           the simulator's seed (default: 1)\n"
-      "  -d, --device-root DIR  the phone's file system for the application: it\n"
-      "                         holds the marker that offers saving and the\n"
-      "                         snapshots (default: $XDG_STATE_HOME/corvane/demo-device,\n"
-      "                         else ~/.local/state/corvane/demo-device)\n"
-      "  -h, --help             show this help\n"
-      "  -V, --version          show the version\n"
-      "\n"
-      "Needs a display; without one, run it under xvfb-run -a, or use corvane-monitor.\n",
-      kUsage);
-}
-
-int usageError(const std::string& message) { return corvane::tools::usageError("corvane-demo", kUsage, message); }
+const corvane::ProgramUsage kProgram{
+    "corvane-demo",
+    "Usage: corvane-demo [--technology NAME] [--seed N] [--device-root DIR]\n",
+    "\n"
+    "Starts the telephony service with its built-in simulator and the Corvane\n"
+    "application connected to it. Quitting the application, Ctrl-C or SIGTERM\n"
+    "stop both.\n"
+    "\n"
+    "Options:\n"
+    "  -t, --technology NAME  the simulated baseband (default: IFX)\n"
+    "  -s, --seed N           the simulator's seed (default: 1)\n"
+    "  -d, --device-root DIR  the phone's file system for the application: it\n"
+    "                         holds the marker that offers saving and the\n"
+    "                         snapshots (default: $XDG_STATE_HOME/corvane/demo-device,\n"
+    "                         else ~/.local/state/corvane/demo-device)\n"
+    "  -h, --help             show this help\n"
+    "  -V, --version          show the version\n"
+    "\n"
+    "Needs a display; without one, run it under xvfb-run -a, or use corvane-monitor.\n",
+};
 
 int fail(const std::string& message) {
   std::fprintf(stderr, "corvane-demo: %s\n", message.c_str());
@@ -164,35 +158,27 @@ int main(int argc, char** argv) {
   std::string seed = "1";
   fs::path root = defaultDeviceRoot();
 
-  static const option kOptions[] = {
-      {"technology", required_argument, nullptr, 't'}, {"seed", required_argument, nullptr, 's'},
-      {"device-root", required_argument, nullptr, 'd'}, {"help", no_argument, nullptr, 'h'},
-      {"version", no_argument, nullptr, 'V'},           {nullptr, 0, nullptr, 0},
+  static constexpr corvane::CommandLineOption kOptions[] = {
+      {"technology", 't', true},
+      {"seed", 's', true},
+      {"device-root", 'd', true},
   };
-  opterr = 0;
-  for (;;) {
-    const int c = getopt_long(argc, argv, ":t:s:d:hV", kOptions, nullptr);
-    if (c == -1) break;
-    switch (c) {
-      case 't': technology = optarg; break;
-      case 's': {
-        char* end = nullptr;
-        errno = 0;
-        const unsigned long long value = std::strtoull(optarg, &end, 10);
-        if (errno != 0 || end == optarg || *end != '\0' || optarg[0] == '-') {
-          return usageError(std::string("--seed needs a whole number, not \"") + optarg + "\"");
+  const corvane::ParsedCommandLine parsed = corvane::parseCommandLine(
+      argc, argv, kOptions, [&](std::string_view name, const char* value) -> std::string {
+        if (name == "technology") technology = value;
+        if (name == "device-root") root = fs::absolute(value);
+        if (name == "seed") {
+          char* end = nullptr;
+          errno = 0;
+          const unsigned long long number = std::strtoull(value, &end, 10);
+          if (errno != 0 || end == value || *end != '\0' || value[0] == '-') {
+            return std::string("--seed needs a whole number, not \"") + value + "\"";
+          }
+          seed = std::to_string(number);
         }
-        seed = std::to_string(value);
-        break;
-      }
-      case 'd': root = fs::absolute(optarg); break;
-      case 'h': printHelp(); return 0;
-      case 'V': std::printf("corvane-demo %s\n", corvane::kVersion); return 0;
-      case ':': return usageError(std::string("option ") + argv[optind - 1] + " needs a value");
-      default: return usageError(std::string("unknown option ") + argv[optind - 1]);
-    }
-  }
-  if (optind < argc) return usageError(std::string("unexpected argument \"") + argv[optind] + "\"");
+        return {};
+      });
+  if (const std::optional<int> status = corvane::answerCommandLine(parsed, kProgram)) return *status;
 
   if (!corvane::displayAvailable()) return fail(corvane::noDisplayMessage("corvane-demo"));
 

@@ -4,8 +4,6 @@
 // the generator. Two runs: a generator that only counts (the delivery path:
 // sockets, event loop, port callback, model), and the real IFX decoder (the
 // whole path including property-list decoding).
-//
-// Usage: model_delivery_bench [PACKETS] [PATH-TO-corvane-telephonyd]
 
 #include <signal.h>
 #include <sys/wait.h>
@@ -21,6 +19,7 @@
 #include <string>
 
 #include "LogGenerator/GSM/GSMLogGenerator.h"
+#include "ServiceBenchCommandLine.h"
 #include "model/CorvaneModel.h"
 #include "platform/Log.h"
 #include "platform/QtRunLoop.h"
@@ -33,6 +32,16 @@ namespace {
 
 using namespace corvane;
 using Clock = std::chrono::steady_clock;
+
+const ProgramUsage kProgram{
+    "model_delivery_bench",
+    "Usage: model_delivery_bench [PACKETS] [PATH-TO-corvane-telephonyd]\n",
+    "\n"
+    "Streams PACKETS packets (default 1000000) from corvane-telephonyd at full\n"
+    "speed into the monitor model with a counting generator, then a twentieth\n"
+    "of them with the IFX decoder, and prints packets per second; fails when\n"
+    "any is lost.\n",
+};
 
 // Counts packets and the time from the first to the last; decodes with `inner` when given.
 class TimingGenerator final : public LogGenerator {
@@ -108,8 +117,11 @@ int run(const std::string& daemon, const std::filesystem::path& runtime, unsigne
 }  // namespace
 
 int main(int argc, char** argv) {
-  const unsigned long long packets = argc > 1 ? std::strtoull(argv[1], nullptr, 10) : 1'000'000ULL;
-  const std::string daemon = argc > 2 ? argv[2] : CORVANE_TELEPHONYD_BINARY;
+  int exitStatus = 0;
+  const auto options = bench::parseServiceBenchOptions(argc, argv, kProgram, 1'000'000ULL, exitStatus);
+  if (!options) return exitStatus;
+  const unsigned long long packets = options->packets;
+  const std::string& daemon = options->daemon;
   log::setSink(std::make_shared<log::CapturingSink>());
 
   char pattern[] = "/tmp/corvane-bench-XXXXXX";

@@ -2,8 +2,6 @@
 // full speed into a local port of this process, exactly as the application
 // receives packets (Qt event loop, port callback per packet). The service is
 // told to send a fixed number of packets; all of them must arrive.
-//
-// Usage: transport_bench [PACKETS] [PATH-TO-corvane-telephonyd]
 
 #include <signal.h>
 #include <spawn.h>
@@ -21,6 +19,7 @@
 #include <thread>
 #include <vector>
 
+#include "ServiceBenchCommandLine.h"
 #include "platform/PropertyList.h"
 #include "platform/QtRunLoop.h"
 #include "platform/RuntimeDirectory.h"
@@ -34,6 +33,14 @@ namespace {
 using namespace corvane;
 using Clock = std::chrono::steady_clock;
 
+const ProgramUsage kProgram{
+    "transport_bench",
+    "Usage: transport_bench [PACKETS] [PATH-TO-corvane-telephonyd]\n",
+    "\n"
+    "Streams PACKETS packets (default 2000000) from corvane-telephonyd at full\n"
+    "speed into a local port and prints the throughput; fails when any is lost.\n",
+};
+
 int fail(const std::string& message) {
   std::fprintf(stderr, "transport_bench: %s\n", message.c_str());
   return 1;
@@ -44,9 +51,11 @@ Bytes command(const Dictionary& fields) { return plist::serializeOrThrow(Value(f
 }  // namespace
 
 int main(int argc, char** argv) {
-  const unsigned long long packets = argc > 1 ? std::strtoull(argv[1], nullptr, 10) : 2'000'000ULL;
-  const std::string daemon = argc > 2 ? argv[2] : CORVANE_TELEPHONYD_BINARY;
-  if (packets == 0) return fail("the packet count must be positive");
+  int exitStatus = 0;
+  const auto options = bench::parseServiceBenchOptions(argc, argv, kProgram, 2'000'000ULL, exitStatus);
+  if (!options) return exitStatus;
+  const unsigned long long packets = options->packets;
+  const std::string& daemon = options->daemon;
 
   char pattern[] = "/tmp/corvane-bench-XXXXXX";
   if (!::mkdtemp(pattern)) return fail("cannot make a temporary directory");

@@ -1,14 +1,12 @@
 #include "telephonyd/ServiceOptions.h"
 
-#include <getopt.h>
-
 #include <algorithm>
 #include <cerrno>
 #include <cmath>
 #include <cstdlib>
 
+#include "platform/CommandLine.h"
 #include "platform/LogChannelTechnology.h"
-#include "platform/Version.h"
 
 namespace corvane::telephonyd {
 
@@ -20,7 +18,7 @@ constexpr std::uint64_t kLatestClockStart = 100'000'000'000;  // in the year 513
 ParsedOptions failure(std::string error) {
   ParsedOptions parsed;
   parsed.exit = true;
-  parsed.exitCode = 2;
+  parsed.exitCode = kExitUsage;
   parsed.error = std::move(error) + " (see --help)";
   return parsed;
 }
@@ -48,93 +46,76 @@ bool parseRate(const char* text, double& rate) {
   return true;
 }
 
+const ProgramUsage kProgram{
+    "corvane-telephonyd",
+    "Usage: corvane-telephonyd [OPTION]...\n",
+    "Serve network-monitor log channels to Corvane from the built-in simulator.\n"
+    "\n"
+    "  -t, --technology NAME  technology to simulate (default IFX)\n"
+    "  -s, --seed N           seed of the simulated scenario (default 1)\n"
+    "  -r, --rate N           packets per second; 0 or \"max\": as fast as clients read (default 2)\n"
+    "  -n, --packets N        stop sending to a channel after N packets (default: no limit)\n"
+    "      --clock-start S    start the simulated clock of the log-code technologies'\n"
+    "                         packet timestamps at S seconds since 1970-01-01 UTC\n"
+    "                         (default: the time the service starts)\n"
+    "      --log-stderr       copy log lines to standard error\n"
+    "  -h, --help             show this help and exit\n"
+    "  -V, --version          show the version and exit\n"
+    "\n"
+    "IFX streams property-list reports. Quendra_GSM, Quendra_LTE and Quendra_UTRAN2\n"
+    "stream log records, only the codes that a channel's start command asks for:\n"
+    "so far the extra codes 0 (SIM files), 1 (cell list) and 2 (PDP contexts).\n"
+    "\n"
+    "Sockets live in $CORVANE_RUNTIME_DIR, else $XDG_RUNTIME_DIR/corvane, else /tmp/corvane-$UID.\n"
+    "SIGTERM or SIGINT stop the service and remove its sockets.\n",
+};
+
 }  // namespace
 
-std::string serviceUsage() {
-  return "Usage: corvane-telephonyd [OPTION]...\n"
-         "Serve network-monitor log channels to Corvane from the built-in simulator.\n"
-         "\n"
-         "  -t, --technology NAME  technology to simulate (default IFX)\n"
-         "  -s, --seed N           seed of the simulated scenario (default 1)\n"
-         "  -r, --rate N           packets per second; 0 or \"max\": as fast as clients read (default 2)\n"
-         "  -n, --packets N        stop sending to a channel after N packets (default: no limit)\n"
-         "      --clock-start S    start the simulated clock of the log-code technologies'\n"
-         "                         packet timestamps at S seconds since 1970-01-01 UTC\n"
-         "                         (default: the time the service starts)\n"
-         "      --log-stderr       copy log lines to standard error\n"
-         "  -h, --help             show this help and exit\n"
-         "  -V, --version          show the version and exit\n"
-         "\n"
-         "IFX streams property-list reports. Quendra_GSM, Quendra_LTE and Quendra_UTRAN2\n"
-         "stream log records, only the codes that a channel's start command asks for:\n"
-         "so far the extra codes 0 (SIM files), 1 (cell list) and 2 (PDP contexts).\n"
-         "\n"
-         "Sockets live in $CORVANE_RUNTIME_DIR, else $XDG_RUNTIME_DIR/corvane, else /tmp/corvane-$UID.\n"
-         "SIGTERM or SIGINT stop the service and remove its sockets.\n";
-}
+std::string serviceUsage() { return helpText(kProgram); }
 
 ParsedOptions parseServiceOptions(int argc, char** argv) {
-  enum { kLogStderr = 1000, kClockStart };
-  static const option kLongOptions[] = {
-      {"technology", required_argument, nullptr, 't'}, {"seed", required_argument, nullptr, 's'},
-      {"rate", required_argument, nullptr, 'r'},       {"packets", required_argument, nullptr, 'n'},
-      {"log-stderr", no_argument, nullptr, kLogStderr}, {"clock-start", required_argument, nullptr, kClockStart},
-      {"help", no_argument, nullptr, 'h'},             {"version", no_argument, nullptr, 'V'},
-      {nullptr, 0, nullptr, 0}};
-
+  static constexpr CommandLineOption kOptions[] = {
+      {"technology", 't', true},  {"seed", 's', true},        {"rate", 'r', true},
+      {"packets", 'n', true},     {"clock-start", 0, true},   {"log-stderr", 0, false},
+  };
   ParsedOptions parsed;
-  // getopt keeps its state in globals: start afresh, and report errors ourselves.
-  optind = 0;
-  opterr = 0;
-  for (;;) {
-    const int previous = optind == 0 ? 1 : optind;
-    const int option = getopt_long(argc, argv, ":t:s:r:n:hV", kLongOptions, nullptr);
-    if (option == -1) break;
-    const std::string given = previous < argc ? argv[previous] : "";
-    switch (option) {
-      case 't':
-        parsed.options.technology = optarg;
-        break;
-      case 's':
-        if (!parseUnsigned(optarg, parsed.options.seed)) return failure("invalid seed '" + std::string(optarg) + "'");
-        break;
-      case 'r':
-        if (!parseRate(optarg, parsed.options.rate)) {
-          return failure("invalid rate '" + std::string(optarg) + "': give packets per second, or 0 or max");
+  const ParsedCommandLine commandLine =
+      parseCommandLine(argc, argv, kOptions, [&](std::string_view name, const char* value) -> std::string {
+        ServiceOptions& options = parsed.options;
+        if (name == "technology") options.technology = value;
+        if (name == "seed" && !parseUnsigned(value, options.seed)) return "invalid seed '" + std::string(value) + "'";
+        if (name == "rate" && !parseRate(value, options.rate)) {
+          return "invalid rate '" + std::string(value) + "': give packets per second, or 0 or max";
         }
-        break;
-      case 'n':
-        if (!parseUnsigned(optarg, parsed.options.packetLimit)) {
-          return failure("invalid packet count '" + std::string(optarg) + "'");
+        if (name == "packets" && !parseUnsigned(value, options.packetLimit)) {
+          return "invalid packet count '" + std::string(value) + "'";
         }
-        break;
-      case kClockStart: {
-        std::uint64_t seconds = 0;
-        // Microseconds since 1970 must fit the 64-bit timestamp for a long while yet.
-        if (!parseUnsigned(optarg, seconds) || seconds > kLatestClockStart) {
-          return failure("invalid clock start '" + std::string(optarg) + "': give seconds since 1970-01-01 UTC");
+        if (name == "clock-start") {
+          std::uint64_t seconds = 0;
+          // Microseconds since 1970 must fit the 64-bit timestamp for a long while yet.
+          if (!parseUnsigned(value, seconds) || seconds > kLatestClockStart) {
+            return "invalid clock start '" + std::string(value) + "': give seconds since 1970-01-01 UTC";
+          }
+          options.clockStart = seconds;
         }
-        parsed.options.clockStart = seconds;
-        break;
-      }
-      case kLogStderr:
-        parsed.options.logToStandardError = true;
-        break;
-      case 'h':
-        parsed.exit = true;
-        parsed.output = serviceUsage();
-        return parsed;
-      case 'V':
-        parsed.exit = true;
-        parsed.output = std::string("corvane-telephonyd ") + kVersion + "\n";
-        return parsed;
-      case ':':
-        return failure("option '" + given + "' needs a value");
-      default:
-        return failure("unknown option '" + given + "'");
-    }
+        if (name == "log-stderr") options.logToStandardError = true;
+        return {};
+      });
+  switch (commandLine.request) {
+    case ParsedCommandLine::Request::Run:
+      break;
+    case ParsedCommandLine::Request::Help:
+      parsed.exit = true;
+      parsed.output = serviceUsage();
+      return parsed;
+    case ParsedCommandLine::Request::Version:
+      parsed.exit = true;
+      parsed.output = versionText(kProgram.name);
+      return parsed;
+    case ParsedCommandLine::Request::UsageError:
+      return failure(commandLine.error);
   }
-  if (optind < argc) return failure("unexpected argument '" + std::string(argv[optind]) + "'");
 
   const auto& known = kAllLogChannelTechnologies;
   if (std::find(known.begin(), known.end(), parsed.options.technology) == known.end()) {

@@ -1,78 +1,73 @@
 // corvane-decode: the offline decoder. Folds every packet of its inputs into one
 // generator and one state, in order, then prints the display tree once.
 
-#include <getopt.h>
-
+#include <cerrno>
 #include <cstdio>
 #include <cstring>
 #include <memory>
+#include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "LogGenerator/LogGenerator.h"
 #include "LogGenerator/logcode/ClassIndex.h"
 #include "PacketInput.h"
-#include "CommandLine.h"
+#include "ToolOptions.h"
 #include "TreePrinter.h"
 #include "model/CorvaneModelNode.h"
 #include "platform/Assertion.h"
+#include "platform/CommandLine.h"
 #include "platform/Log.h"
 #include "platform/LogChannelTechnology.h"
-#include "platform/Version.h"
 
 namespace {
 
 constexpr int kExitInput = 1;
 constexpr int kExitAssertion = 3;
 
-constexpr const char* kUsage =
-    "Usage: corvane-decode --technology NAME [--format text|json] [--log] [FILE...]\n";
+const corvane::ProgramUsage kProgram{
+    "corvane-decode",
+    "Usage: corvane-decode --technology NAME [--format text|json] [--log] [FILE...]\n",
+    "\n"
+    "Decodes baseband log packets offline and prints the display tree.\n"
+    "\n"
+    "Each FILE (standard input when none is given, or for \"-\") is read in the\n"
+    "format its contents show:\n"
+    "  property list  one packet (XML or binary)\n"
+    "  snapshot       a property list with \"Timestamp\" and \"Data\", as the\n"
+    "                 application saves it: the packets of its history are\n"
+    "                 replayed in order; its DLF only when the history holds none\n"
+    "  DLF            any other binary: log records (16-bit length of the whole\n"
+    "                 record, 16-bit code, 8-byte timestamp, payload), each\n"
+    "                 replayed as a packet of type 0x01, or 0xFF when its payload\n"
+    "                 is a binary property list; version reports (code 0x1FFD)\n"
+    "                 are skipped. In a DLF that the application saved (it opens\n"
+    "                 with the application's version report), a 0x01 or 0xFF\n"
+    "                 may be a packet's type byte kept in the file: the reading\n"
+    "                 of the whole file with the most records wins, then the one\n"
+    "                 with the fewest records without a type byte (on a tie: no\n"
+    "                 type byte); other DLFs are read record after record\n"
+    "  hex text       one packet per line in hex, exactly as the telephony\n"
+    "                 service delivers it; blanks and colons may stand between\n"
+    "                 bytes, blank lines and lines starting with # are skipped\n"
+    "A file cut off in its last record or packet is read up to there, with a\n"
+    "warning that names the offset.\n"
+    "\n"
+    "Options:\n"
+    "  -t, --technology NAME  the log-channel technology: IFX, Quendra_GSM,\n"
+    "                         Quendra_CDMA, Quendra_LTE or Quendra_UTRAN2\n"
+    "  -f, --format FORMAT    text (an indented tree, the default) or json\n"
+    "  -l, --log              also write the decoders' system-log lines to\n"
+    "                         standard error as \"<priority> <text>\"\n"
+    "  -h, --help             show this help\n"
+    "  -V, --version          show the version\n"
+    "\n"
+    "Exit status: 0 on success, 1 for unreadable or malformed input, 2 for bad\n"
+    "usage, 3 when a decoder met data it asserts it never receives.\n",
+};
 
-void printHelp() {
-  std::printf(
-      "%s"
-      "\n"
-      "Decodes baseband log packets offline and prints the display tree.\n"
-      "\n"
-      "Each FILE (standard input when none is given, or for \"-\") is read in the\n"
-      "format its contents show:\n"
-      "  property list  one packet (XML or binary)\n"
-      "  snapshot       a property list with \"Timestamp\" and \"Data\", as the\n"
-      "                 application saves it: the packets of its history are\n"
-      "                 replayed in order; its DLF only when the history holds none\n"
-      "  DLF            any other binary: log records (16-bit length of the whole\n"
-      "                 record, 16-bit code, 8-byte timestamp, payload), each\n"
-      "                 replayed as a packet of type 0x01, or 0xFF when its payload\n"
-      "                 is a binary property list; version reports (code 0x1FFD)\n"
-      "                 are skipped. In a DLF that the application saved (it opens\n"
-      "                 with the application's version report), a 0x01 or 0xFF\n"
-      "                 may be a packet's type byte kept in the file: the reading\n"
-      "                 of the whole file with the most records wins, then the one\n"
-      "                 with the fewest records without a type byte (on a tie: no\n"
-      "                 type byte); other DLFs are read record after record\n"
-      "  hex text       one packet per line in hex, exactly as the telephony\n"
-      "                 service delivers it; blanks and colons may stand between\n"
-      "                 bytes, blank lines and lines starting with # are skipped\n"
-      "A file cut off in its last record or packet is read up to there, with a\n"
-      "warning that names the offset.\n"
-      "\n"
-      "Options:\n"
-      "  -t, --technology NAME  the log-channel technology: IFX, Quendra_GSM,\n"
-      "                         Quendra_CDMA, Quendra_LTE or Quendra_UTRAN2\n"
-      "  -f, --format FORMAT    text (an indented tree, the default) or json\n"
-      "  -l, --log              also write the decoders' system-log lines to\n"
-      "                         standard error as \"<priority> <text>\"\n"
-      "  -h, --help             show this help\n"
-      "  -V, --version          show the version\n"
-      "\n"
-      "Exit status: 0 on success, 1 for unreadable or malformed input, 2 for bad\n"
-      "usage, 3 when a decoder met data it asserts it never receives.\n",
-      kUsage);
-}
-
-int usageError(const std::string& message) {
-  return corvane::tools::usageError("corvane-decode", kUsage, message);
-}
+int usageError(const std::string& message) { return corvane::usageError(kProgram, message); }
 
 bool isKnownTechnology(const std::string& name) {
   for (auto t : corvane::kAllLogChannelTechnologies) {
@@ -90,34 +85,27 @@ int main(int argc, char** argv) {
   std::string format = "text";
   bool logToStderr = false;
 
-  static const option kOptions[] = {
-      {"technology", required_argument, nullptr, 't'},
-      {"format", required_argument, nullptr, 'f'},
-      {"log", no_argument, nullptr, 'l'},
-      {"help", no_argument, nullptr, 'h'},
-      {"version", no_argument, nullptr, 'V'},
-      {nullptr, 0, nullptr, 0},
+  static constexpr CommandLineOption kOptions[] = {
+      {"technology", 't', true},
+      {"format", 'f', true},
+      {"log", 'l', false},
   };
-  opterr = 0;
-  for (;;) {
-    const int c = getopt_long(argc, argv, ":t:f:lhV", kOptions, nullptr);
-    if (c == -1) break;
-    switch (c) {
-      case 't': technology = optarg; break;
-      case 'f': format = optarg; break;
-      case 'l': logToStderr = true; break;
-      case 'h': printHelp(); return 0;
-      case 'V': std::printf("corvane-decode %s\n", kVersion); return 0;
-      case ':': return usageError(std::string("option ") + argv[optind - 1] + " needs a value");
-      default: return usageError(std::string("unknown option ") + argv[optind - 1]);
-    }
-  }
+  const ParsedCommandLine parsed = parseCommandLine(
+      argc, argv, kOptions,
+      [&](std::string_view name, const char* value) {
+        if (name == "technology") technology = value;
+        if (name == "format") format = value;
+        if (name == "log") logToStderr = true;
+        return std::string();
+      },
+      true);
+  if (const std::optional<int> status = answerCommandLine(parsed, kProgram)) return *status;
   if (technology.empty()) return usageError("--technology NAME is required");
   if (!isKnownTechnology(technology)) return usageError("unknown technology \"" + technology + "\"");
   const std::optional<tools::TreeFormat> treeFormat = tools::treeFormatNamed(format);
   if (!treeFormat) return usageError("unknown format \"" + format + "\" (text or json)");
 
-  std::vector<std::string> inputs(argv + optind, argv + argc);
+  std::vector<std::string> inputs = parsed.operands;
   if (inputs.empty()) inputs.emplace_back("-");
 
   // Read everything first, so that bad input stops the run before any decoding.

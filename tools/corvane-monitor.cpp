@@ -2,60 +2,54 @@
 // against the telephony service and prints the display tree after every
 // display update, for scripts, tests and SSH sessions.
 
-#include <getopt.h>
-
 #include <QCoreApplication>
 
+#include <cerrno>
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
 #include <memory>
+#include <optional>
 #include <string>
+#include <string_view>
 
-#include "CommandLine.h"
 #include "LogGenerator/logcode/ClassIndex.h"
+#include "ToolOptions.h"
 #include "TreePrinter.h"
 #include "model/CorvaneModel.h"
 #include "model/SocketModelEnvironment.h"
 #include "platform/Assertion.h"
+#include "platform/CommandLine.h"
 #include "platform/DateText.h"
 #include "platform/Log.h"
 #include "platform/SignalEvents.h"
-#include "platform/Version.h"
 
 namespace {
 
 constexpr int kExitFailure = 1;
 
-constexpr const char* kUsage = "Usage: corvane-monitor [--format text|json] [--updates N] [--log]\n";
-
-void printHelp() {
-  std::printf(
-      "%s"
-      "\n"
-      "Connects to the telephony service (corvane-telephonyd), decodes the packets\n"
-      "of its log channel and prints the display tree after every display update\n"
-      "(at most every 2 s, when packets arrived). It retries every 5 s while the\n"
-      "service is unreachable and keeps its history across reconnects.\n"
-      "\n"
-      "Options:\n"
-      "  -f, --format FORMAT  text (an indented tree, followed by a blank line) or\n"
-      "                       json (one compact JSON document per line)\n"
-      "  -n, --updates N      stop after N display updates (default: run until\n"
-      "                       interrupted)\n"
-      "  -l, --log            also write the system-log lines to standard error as\n"
-      "                       \"<priority> <text>\"\n"
-      "  -h, --help           show this help\n"
-      "  -V, --version        show the version\n"
-      "\n"
-      "The runtime directory is $CORVANE_RUNTIME_DIR, else $XDG_RUNTIME_DIR/corvane,\n"
-      "else /tmp/corvane-$UID.\n",
-      kUsage);
-}
-
-int usageError(const std::string& message) {
-  return corvane::tools::usageError("corvane-monitor", kUsage, message);
-}
+const corvane::ProgramUsage kProgram{
+    "corvane-monitor",
+    "Usage: corvane-monitor [--format text|json] [--updates N] [--log]\n",
+    "\n"
+    "Connects to the telephony service (corvane-telephonyd), decodes the packets\n"
+    "of its log channel and prints the display tree after every display update\n"
+    "(at most every 2 s, when packets arrived). It retries every 5 s while the\n"
+    "service is unreachable and keeps its history across reconnects.\n"
+    "\n"
+    "Options:\n"
+    "  -f, --format FORMAT  text (an indented tree, followed by a blank line) or\n"
+    "                       json (one compact JSON document per line)\n"
+    "  -n, --updates N      stop after N display updates (default: run until\n"
+    "                       interrupted)\n"
+    "  -l, --log            also write the system-log lines to standard error as\n"
+    "                       \"<priority> <text>\"\n"
+    "  -h, --help           show this help\n"
+    "  -V, --version        show the version\n"
+    "\n"
+    "The runtime directory is $CORVANE_RUNTIME_DIR, else $XDG_RUNTIME_DIR/corvane,\n"
+    "else /tmp/corvane-$UID.\n",
+};
 
 class Monitor final : public corvane::CorvaneModelDelegate {
  public:
@@ -88,36 +82,28 @@ int main(int argc, char** argv) {
   long updates = 0;
   bool logToStderr = false;
 
-  static const option kOptions[] = {
-      {"format", required_argument, nullptr, 'f'}, {"updates", required_argument, nullptr, 'n'},
-      {"log", no_argument, nullptr, 'l'},          {"help", no_argument, nullptr, 'h'},
-      {"version", no_argument, nullptr, 'V'},      {nullptr, 0, nullptr, 0},
+  static constexpr CommandLineOption kOptions[] = {
+      {"format", 'f', true},
+      {"updates", 'n', true},
+      {"log", 'l', false},
   };
-  opterr = 0;
-  for (;;) {
-    const int c = getopt_long(argc, argv, ":f:n:lhV", kOptions, nullptr);
-    if (c == -1) break;
-    switch (c) {
-      case 'f': format = optarg; break;
-      case 'n': {
-        char* end = nullptr;
-        errno = 0;
-        updates = std::strtol(optarg, &end, 10);
-        if (errno != 0 || end == optarg || *end != '\0' || updates < 1) {
-          return usageError(std::string("--updates needs a whole number of at least 1, not \"") + optarg + "\"");
+  const ParsedCommandLine parsed =
+      parseCommandLine(argc, argv, kOptions, [&](std::string_view name, const char* value) -> std::string {
+        if (name == "format") format = value;
+        if (name == "log") logToStderr = true;
+        if (name == "updates") {
+          char* end = nullptr;
+          errno = 0;
+          updates = std::strtol(value, &end, 10);
+          if (errno != 0 || end == value || *end != '\0' || updates < 1) {
+            return std::string("--updates needs a whole number of at least 1, not \"") + value + "\"";
+          }
         }
-        break;
-      }
-      case 'l': logToStderr = true; break;
-      case 'h': printHelp(); return 0;
-      case 'V': std::printf("corvane-monitor %s\n", kVersion); return 0;
-      case ':': return usageError(std::string("option ") + argv[optind - 1] + " needs a value");
-      default: return usageError(std::string("unknown option ") + argv[optind - 1]);
-    }
-  }
-  if (optind < argc) return usageError(std::string("unexpected argument \"") + argv[optind] + "\"");
+        return {};
+      });
+  if (const std::optional<int> status = answerCommandLine(parsed, kProgram)) return *status;
   const std::optional<tools::TreeFormat> treeFormat = tools::treeFormatNamed(format);
-  if (!treeFormat) return usageError("unknown format \"" + format + "\" (text or json)");
+  if (!treeFormat) return usageError(kProgram, "unknown format \"" + format + "\" (text or json)");
 
   QCoreApplication app(argc, argv);
   std::string error;

@@ -15,6 +15,7 @@
 #include <thread>
 #include <vector>
 
+#include "platform/Version.h"
 #include "support/Process.h"
 
 namespace corvane {
@@ -126,8 +127,21 @@ TEST_F(DemoLauncher, WithoutADisplayItSaysSoInOneLineNamingTheHeadlessWays) {
 TEST_F(DemoLauncher, RejectsArgumentsItDoesNotKnow) {
   const test::ProcessResult result = test::runProcess({kDemo, "--frobnicate"});
   EXPECT_EQ(result.exitCode, 2);
-  EXPECT_NE(result.err.find("unknown option --frobnicate"), std::string::npos);
+  EXPECT_EQ(result.err.rfind("corvane-demo: unknown option '--frobnicate'\nUsage: corvane-demo", 0), 0u)
+      << result.err;
   EXPECT_EQ(test::runProcess({kDemo, "--seed", "many"}).exitCode, 2);
+  EXPECT_EQ(test::runProcess({kDemo, "extra"}).exitCode, 2);
+}
+
+TEST_F(DemoLauncher, HelpAndVersionNeedNoDisplayAndStartNothing) {
+  const std::vector<std::string> headless{"DISPLAY=", "WAYLAND_DISPLAY=", "QT_QPA_PLATFORM="};
+  const test::ProcessResult help = test::runProcess({kDemo, "--help"}, "", headless);
+  EXPECT_EQ(help.exitCode, 0);
+  EXPECT_EQ(help.out.rfind("Usage: corvane-demo", 0), 0u) << help.out;
+  EXPECT_NE(help.out.find("--device-root DIR"), std::string::npos);
+  const test::ProcessResult version = test::runProcess({kDemo, "--version"}, "", headless);
+  EXPECT_EQ(version.exitCode, 0);
+  EXPECT_EQ(version.out, std::string("corvane-demo ") + kVersion + "\n");
 }
 
 TEST_F(DemoLauncher, WhenTheApplicationQuitsTheServiceStopsToo) {

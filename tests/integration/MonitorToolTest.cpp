@@ -11,6 +11,7 @@
 
 #include <nlohmann/json.hpp>
 
+#include "platform/Version.h"
 #include "support/Process.h"
 
 namespace corvane {
@@ -64,9 +65,19 @@ TEST(MonitorTool, BadUsageExitsWithTwo) {
     EXPECT_EQ(r.exitCode, 2) << args.back();
     EXPECT_NE(r.err.find("Usage: corvane-monitor"), std::string::npos) << r.err;
   }
+  const auto unknown = test::runProcess({kMonitor, "--bogus"});
+  EXPECT_EQ(unknown.err.rfind("corvane-monitor: unknown option '--bogus'\n", 0), 0u) << unknown.err;
+  EXPECT_EQ(unknown.out, "");
+}
+
+TEST(MonitorTool, HelpAndVersionNameTheProgramAndExitWithZero) {
   const auto help = test::runProcess({kMonitor, "--help"});
   EXPECT_EQ(help.exitCode, 0);
   EXPECT_EQ(help.out.rfind("Usage: corvane-monitor", 0), 0u);
+  EXPECT_NE(help.out.find("--updates N"), std::string::npos);
+  const auto version = test::runProcess({kMonitor, "--version"});
+  EXPECT_EQ(version.exitCode, 0);
+  EXPECT_EQ(version.out, std::string("corvane-monitor ") + kVersion + "\n");
 }
 
 TEST(MonitorTool, AnUnusableRuntimeDirectoryIsAOneLineError) {

@@ -21,6 +21,7 @@
 #include "platform/PropertyList.h"
 #include "platform/SocketMessagePort.h"
 #include "platform/SocketTelephonyClient.h"
+#include "platform/Version.h"
 #include "platform/VirtualRunLoop.h"
 #include "support/LogRecords.h"
 #include "support/Process.h"
@@ -487,6 +488,17 @@ TEST_F(DaemonTest, BadOptionExitsWithStatus2AndOneLine) {
   const auto result = test::runProcess({kDaemon, "--bogus"});
   EXPECT_EQ(result.exitCode, 2);
   EXPECT_EQ(result.err, "corvane-telephonyd: unknown option '--bogus' (see --help)\n");
+  EXPECT_TRUE(serviceSockets(runtime.path()).empty());
+}
+
+TEST_F(DaemonTest, HelpAndVersionNameTheProgramAndExitWithStatus0) {
+  const auto help = test::runProcess({kDaemon, "--help"});
+  EXPECT_EQ(help.exitCode, 0);
+  EXPECT_EQ(help.out.rfind("Usage: corvane-telephonyd", 0), 0u) << help.out;
+  EXPECT_EQ(help.err, "");
+  const auto version = test::runProcess({kDaemon, "--version"});
+  EXPECT_EQ(version.exitCode, 0);
+  EXPECT_EQ(version.out, std::string("corvane-telephonyd ") + kVersion + "\n");
   EXPECT_TRUE(serviceSockets(runtime.path()).empty());
 }
 

@@ -5,6 +5,8 @@
 #include <string>
 #include <vector>
 
+#include "platform/Version.h"
+
 namespace corvane::telephonyd {
 namespace {
 
@@ -55,6 +57,8 @@ TEST(ServiceOptionsTest, BadInputExitsWithStatus2AndOneLine) {
     EXPECT_EQ(parsed.error.find('\n'), std::string::npos);
   }
   EXPECT_EQ(parse({"--bogus"}).error, "unknown option '--bogus' (see --help)");
+  EXPECT_EQ(parse({"--rate"}).error, "option '--rate' needs a value (see --help)");
+  EXPECT_EQ(parse({"extra"}).error, "unexpected argument 'extra' (see --help)");
   EXPECT_EQ(parse({"--clock-start", "-1"}).error,
             "invalid clock start '-1': give seconds since 1970-01-01 UTC (see --help)");
   EXPECT_EQ(parse({"--technology", "Nope"}).error,
@@ -66,11 +70,16 @@ TEST(ServiceOptionsTest, HelpAndVersionPrintAndExitWithStatus0) {
   const ParsedOptions help = parse({"--help"});
   EXPECT_TRUE(help.exit);
   EXPECT_EQ(help.exitCode, 0);
+  EXPECT_EQ(help.output.rfind("Usage: corvane-telephonyd", 0), 0u);
   EXPECT_NE(help.output.find("--technology"), std::string::npos);
+  EXPECT_NE(help.output.find("--clock-start"), std::string::npos);
+  EXPECT_EQ(help.output, serviceUsage());
   const ParsedOptions version = parse({"--version"});
   EXPECT_TRUE(version.exit);
   EXPECT_EQ(version.exitCode, 0);
-  EXPECT_EQ(version.output.rfind("corvane-telephonyd ", 0), 0u);
+  EXPECT_EQ(version.output, std::string("corvane-telephonyd ") + kVersion + "\n");
+  EXPECT_EQ(parse({"-V"}).output, version.output);
+  EXPECT_EQ(parse({"-h"}).output, help.output);
 }
 
 }  // namespace

@@ -4,6 +4,7 @@
 
 #include <nlohmann/json.hpp>
 
+#include "platform/Version.h"
 #include "support/LogRecords.h"
 #include "support/Process.h"
 #include "support/Values.h"
@@ -209,12 +210,24 @@ TEST(DecodeTool, BadUsageExitsWithTwo) {
 }
 
 TEST(DecodeTool, HelpAndVersion) {
-  const auto help = runProcess({kDecode, "--help"});
-  EXPECT_EQ(help.exitCode, 0);
-  EXPECT_EQ(help.out.rfind("Usage: corvane-decode --technology NAME", 0), 0u);
-  const auto version = runProcess({kDecode, "--version"});
-  EXPECT_EQ(version.exitCode, 0);
-  EXPECT_EQ(version.out.rfind("corvane-decode ", 0), 0u);
+  for (const char* option : {"--help", "-h"}) {
+    const auto help = runProcess({kDecode, option});
+    EXPECT_EQ(help.exitCode, 0);
+    EXPECT_EQ(help.out.rfind("Usage: corvane-decode --technology NAME", 0), 0u);
+    EXPECT_EQ(help.err, "");
+  }
+  for (const char* option : {"--version", "-V"}) {
+    const auto version = runProcess({kDecode, option});
+    EXPECT_EQ(version.exitCode, 0);
+    EXPECT_EQ(version.out, std::string("corvane-decode ") + kVersion + "\n");
+  }
+}
+
+TEST(DecodeTool, AnUnknownOptionIsNamedOnStandardErrorWithStatusTwo) {
+  const auto r = runProcess({kDecode, "-t", "IFX", "--bogus"});
+  EXPECT_EQ(r.exitCode, 2);
+  EXPECT_EQ(r.out, "");
+  EXPECT_EQ(r.err.rfind("corvane-decode: unknown option '--bogus'\nUsage: corvane-decode", 0), 0u) << r.err;
 }
 
 }  // namespace

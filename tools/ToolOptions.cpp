@@ -1,17 +1,11 @@
-#include "CommandLine.h"
+#include "ToolOptions.h"
 
-#include <cstdio>
 #include <memory>
 #include <vector>
 
 #include "platform/Log.h"
 
 namespace corvane::tools {
-
-int usageError(const char* program, const char* usage, const std::string& message) {
-  std::fprintf(stderr, "%s: %s\n%s", program, message.c_str(), usage);
-  return kExitUsage;
-}
 
 std::optional<TreeFormat> treeFormatNamed(std::string_view name) {
   if (name == "text") return TreeFormat::Text;

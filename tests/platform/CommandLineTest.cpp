@@ -1,0 +1,97 @@
+#include "platform/CommandLine.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "platform/Version.h"
+
+namespace corvane {
+namespace {
+
+using Request = ParsedCommandLine::Request;
+
+constexpr CommandLineOption kOptions[] = {
+    {"format", 'f', true},
+    {"log", 'l', false},
+    {"clock-start", 0, true},
+};
+
+// Parses `arguments` (after a program name) and records the options seen, as "name=value" or "name".
+struct Parse {
+  ParsedCommandLine parsed;
+  std::vector<std::string> seen;
+
+  explicit Parse(std::vector<std::string> arguments, bool operandsAllowed = false,
+                 std::string refuse = "") {
+    arguments.insert(arguments.begin(), "program");
+    std::vector<char*> argv;
+    for (auto& a : arguments) argv.push_back(a.data());
+    argv.push_back(nullptr);
+    parsed = parseCommandLine(
+        static_cast<int>(arguments.size()), argv.data(), kOptions,
+        [&](std::string_view name, const char* value) -> std::string {
+          seen.push_back(std::string(name) + (value ? "=" + std::string(value) : ""));
+          return name == refuse ? "no " + std::string(name) + " here" : "";
+        },
+        operandsAllowed);
+  }
+};
+
+TEST(CommandLineTest, OptionsReachTheHandlerInOrderInEveryForm) {
+  const Parse p({"-f", "json", "--log", "--format=text", "--clock-start", "5", "-lfjson"});
+  EXPECT_EQ(p.parsed.request, Request::Run);
+  EXPECT_EQ(p.seen, (std::vector<std::string>{"format=json", "log", "format=text", "clock-start=5", "log",
+                                               "format=json"}));
+}
+
+TEST(CommandLineTest, HelpAndVersionAreEveryProgramsAndEndTheParse) {
+  EXPECT_EQ(Parse({"--help"}).parsed.request, Request::Help);
+  EXPECT_EQ(Parse({"-h"}).parsed.request, Request::Help);
+  EXPECT_EQ(Parse({"--version"}).parsed.request, Request::Version);
+  EXPECT_EQ(Parse({"-V", "--bogus"}).parsed.request, Request::Version);
+  EXPECT_EQ(versionText("corvane-x"), std::string("corvane-x ") + kVersion + "\n");
+}
+
+TEST(CommandLineTest, UsageErrorsNameTheOptionAsItWasWritten) {
+  EXPECT_EQ(Parse({"--bogus"}).parsed.error, "unknown option '--bogus'");
+  EXPECT_EQ(Parse({"--bogus=1"}).parsed.error, "unknown option '--bogus'");
+  EXPECT_EQ(Parse({"--log", "-lx"}).parsed.error, "unknown option '-x'");
+  EXPECT_EQ(Parse({"--format"}).parsed.error, "option '--format' needs a value");
+  EXPECT_EQ(Parse({"-f"}).parsed.error, "option '-f' needs a value");
+  EXPECT_EQ(Parse({"--clock-start"}).parsed.error, "option '--clock-start' needs a value");
+  const Parse bad({"--bogus"});
+  EXPECT_EQ(bad.parsed.request, Request::UsageError);
+  EXPECT_TRUE(bad.seen.empty());
+}
+
+TEST(CommandLineTest, TheHandlersErrorEndsTheParse) {
+  const Parse p({"--log", "--format", "x", "--log"}, false, "format");
+  EXPECT_EQ(p.parsed.request, Request::UsageError);
+  EXPECT_EQ(p.parsed.error, "no format here");
+  EXPECT_EQ(p.seen, (std::vector<std::string>{"log", "format=x"}));
+}
+
+TEST(CommandLineTest, OperandsAreRefusedUnlessAllowedAndMayStandAnywhere) {
+  EXPECT_EQ(Parse({"extra"}).parsed.error, "unexpected argument 'extra'");
+  const Parse p({"a", "--log", "-", "b"}, true);
+  EXPECT_EQ(p.parsed.request, Request::Run);
+  EXPECT_EQ(p.parsed.operands, (std::vector<std::string>{"a", "-", "b"}));
+  EXPECT_EQ(p.seen, std::vector<std::string>{"log"});
+}
+
+TEST(CommandLineTest, EachParseStartsAfresh) {
+  EXPECT_EQ(Parse({"--bogus"}).parsed.request, Request::UsageError);
+  EXPECT_EQ(Parse({"--log"}).parsed.request, Request::Run);
+  EXPECT_EQ(Parse({"--log"}).seen, std::vector<std::string>{"log"});
+}
+
+TEST(CommandLineTest, HelpIsTheUsageThenTheDetails) {
+  const ProgramUsage program{"corvane-x", "Usage: corvane-x\n", "\nDoes x.\n"};
+  EXPECT_EQ(helpText(program), "Usage: corvane-x\n\nDoes x.\n");
+}
+
+}  // namespace
+}  // namespace corvane
