@@ -35,6 +35,12 @@ class PacketView {
   }
   std::uint32_t le32(std::size_t offset) const {
     if (offset >= bytes_.size()) return 0;
+    if (bytes_.size() - offset >= 4) {
+      // Wholly inside: one load.
+      const std::uint8_t* p = bytes_.data() + offset;
+      return static_cast<std::uint32_t>(p[0]) | static_cast<std::uint32_t>(p[1]) << 8 |
+             static_cast<std::uint32_t>(p[2]) << 16 | static_cast<std::uint32_t>(p[3]) << 24;
+    }
     return static_cast<std::uint32_t>(le16(offset)) | (static_cast<std::uint32_t>(le16(offset + 2)) << 16);
   }
   std::uint64_t le64(std::size_t offset) const {

@@ -137,9 +137,9 @@ struct Field {
   // The raw value in a packet, in the entry that begins `entry` bytes in.
   // Bytes beyond the end of the packet read as zero.
   std::uint32_t raw(const PacketView& packet, std::size_t entry = 0) const {
-    const std::size_t at = offset + entry;
-    const std::uint32_t whole = bytes == 1 ? packet.u8(at) : bytes == 2 ? packet.le16(at) : packet.le32(at);
-    return PacketView::bits(whole, first, last);
+    // The bit range lies within the field's own bytes, so the 32 bits from
+    // its offset hold it whatever its width; bytes past the end read as zero.
+    return PacketView::bits(packet.le32(offset + entry), first, last);
   }
   double value(const PacketView& packet, std::size_t entry = 0) const { return conversion.value(raw(packet, entry)); }
 };
