@@ -8,8 +8,13 @@ namespace corvane {
 
 namespace {
 
-// Puts the unit behind the number's characters and ends the text there.
+// Puts the unit behind the number's characters and ends the text there. Every
+// unit is short; the number leaves room for it.
 void endWithUnit(Text& text, char* end, std::string_view unit) {
+  if (unit.empty()) {
+    text.setEnd(end);
+    return;
+  }
   const std::size_t room = Text::kCapacity - static_cast<std::size_t>(end - text.begin());
   text.setEnd(end + unit.copy(end, std::min(room, unit.size())));
 }
@@ -40,8 +45,12 @@ constexpr double kLargestEighths = 1e15;
 
 }  // namespace
 
-Text decimalText(std::uint32_t value) { return wholeText(static_cast<std::int32_t>(value), {}); }
-Text decimalText(std::int32_t value) { return wholeText(value, {}); }
+Text decimalText(std::uint32_t value) { return decimalText(static_cast<std::int32_t>(value)); }
+Text decimalText(std::int32_t value) {
+  Text text;
+  text.setEnd(std::to_chars(text.begin(), text.begin() + 11, value).ptr);
+  return text;
+}
 
 Text wholeText(std::int64_t value, std::string_view unit) {
   Text text;
