@@ -14,23 +14,23 @@ constexpr int kStepMilliseconds = 80;
 ActivityIndicator::ActivityIndicator(QWidget* parent) : QWidget(parent) {
   setObjectName(QStringLiteral("ActivityIndicator"));
   setFixedSize(sizeHint());
-  _timer.setInterval(kStepMilliseconds);
-  connect(&_timer, &QTimer::timeout, this, [this] {
-    _step = (_step + 1) % kSpokes;
+  timer_.setInterval(kStepMilliseconds);
+  connect(&timer_, &QTimer::timeout, this, [this] {
+    step_ = (step_ + 1) % kSpokes;
     update();
   });
   hide();
 }
 
 void ActivityIndicator::startAnimating() {
-  _animating = true;
-  _timer.start();
+  animating_ = true;
+  timer_.start();
   show();
 }
 
 void ActivityIndicator::stopAnimating() {
-  _animating = false;
-  _timer.stop();
+  animating_ = false;
+  timer_.stop();
   hide();
 }
 
@@ -44,7 +44,7 @@ void ActivityIndicator::paintEvent(QPaintEvent*) {
   pen.setCapStyle(Qt::RoundCap);
   for (int i = 0; i < kSpokes; ++i) {
     // The spoke of the current step is the darkest; the ones behind it fade.
-    const int age = (_step - i + kSpokes) % kSpokes;
+    const int age = (step_ - i + kSpokes) % kSpokes;
     QColor colour = pen.color();
     colour.setAlphaF(1.0 - 0.75 * age / (kSpokes - 1));
     pen.setColor(colour);

@@ -16,7 +16,7 @@ class ActivityIndicator final : public QWidget {
 
   void startAnimating();
   void stopAnimating();
-  bool isAnimating() const { return _animating; }
+  bool isAnimating() const { return animating_; }
 
   QSize sizeHint() const override { return {20, 20}; }
 
@@ -24,9 +24,9 @@ class ActivityIndicator final : public QWidget {
   void paintEvent(QPaintEvent* event) override;
 
  private:
-  QTimer _timer;
-  int _step = 0;
-  bool _animating = false;
+  QTimer timer_;
+  int step_ = 0;
+  bool animating_ = false;
 };
 
 }  // namespace corvane

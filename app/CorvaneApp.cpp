@@ -42,37 +42,37 @@ QIcon applicationIcon() { return QIcon(QStringLiteral(":/corvane/corvane.svg"));
 }  // namespace
 
 QString DateFormatter::stringFromDate(const Date& date) const {
-  return QDateTime::fromMSecsSinceEpoch(date.microsecondsSince1970 / 1000, Qt::LocalTime).toString(_pattern);
+  return QDateTime::fromMSecsSinceEpoch(date.microsecondsSince1970 / 1000, Qt::LocalTime).toString(pattern_);
 }
 
-CorvaneApp::CorvaneApp(CorvaneAppEnvironment environment) : _environment(std::move(environment)) {}
+CorvaneApp::CorvaneApp(CorvaneAppEnvironment environment) : environment_(std::move(environment)) {}
 
 CorvaneApp::~CorvaneApp() {
-  if (_running) applicationWillTerminate();
+  if (running_) applicationWillTerminate();
 }
 
 std::filesystem::path CorvaneApp::snapshotDirectory() const {
-  return devicePath(kSnapshotDirectoryPath, _environment.deviceRoot);
+  return devicePath(kSnapshotDirectoryPath, environment_.deviceRoot);
 }
 
 void CorvaneApp::_setGSMRSSI(bool value) {
   const QString domain = QString::fromLatin1(kHomeScreenPreferencesDomain);
   const QString key = QString::fromLatin1(kShowGSMRSSIKey);
-  _environment.preferences.setAppValue(key, value, domain);
-  _environment.preferences.synchronize(domain);
-  _environment.preferences.SendAppPreferencesChanged(domain, key);
+  environment_.preferences.setAppValue(key, value, domain);
+  environment_.preferences.synchronize(domain);
+  environment_.preferences.SendAppPreferencesChanged(domain, key);
 }
 
 void CorvaneApp::getSaveButtonPref() {
   std::error_code error;
-  _allowSaveButton = std::filesystem::exists(devicePath(kSaveEnablingMarkerPath, _environment.deviceRoot), error);
+  _allowSaveButton = std::filesystem::exists(devicePath(kSaveEnablingMarkerPath, environment_.deviceRoot), error);
 }
 
 void CorvaneApp::getRSSIPref() {
   // Read from this application's domain, written to the home screen's: unless
   // this application's own domain says true, the numeric display goes on at
   // every launch.
-  const bool shown = _environment.preferences.getAppBooleanValue(QString::fromLatin1(kShowGSMRSSIKey),
+  const bool shown = environment_.preferences.getAppBooleanValue(QString::fromLatin1(kShowGSMRSSIKey),
                                                                  QString::fromLatin1(kAppPreferencesDomain));
   if (!shown) {
     _unsetRSSI = true;
@@ -81,8 +81,8 @@ void CorvaneApp::getRSSIPref() {
 }
 
 void CorvaneApp::applicationDidFinishLaunching() {
-  if (_running) return;
-  _running = true;
+  if (running_) return;
+  running_ = true;
   getRSSIPref();
   getSaveButtonPref();
 
@@ -99,7 +99,7 @@ void CorvaneApp::applicationDidFinishLaunching() {
     _window->resize(kDesktopWidth, std::min(kDesktopHeight, std::max(480, available.height() - 40)));
   }
 
-  _model = std::make_unique<CorvaneModel>(_environment.model, this);
+  _model = std::make_unique<CorvaneModel>(environment_.model, this);
   _updateMessage = kConnectingWithDots;
   _dateFormatter = std::make_unique<DateFormatter>(QString::fromLatin1(kUpdatePattern));
 
@@ -115,14 +115,14 @@ void CorvaneApp::applicationDidFinishLaunching() {
   _window->activateWindow();
 
   // The monitor starts once the launch has returned.
-  _environment.model.runLoop.dispatchAsync([self = QPointer<CorvaneApp>(this)] {
+  environment_.model.runLoop.dispatchAsync([self = QPointer<CorvaneApp>(this)] {
     if (self && self->_model) self->_model->restartMonitor();
   });
 }
 
 void CorvaneApp::applicationWillTerminate() {
-  if (!_running) return;
-  _running = false;
+  if (!running_) return;
+  running_ = false;
   if (_unsetRSSI) _setGSMRSSI(false);
 
   _updateMessage.clear();
@@ -139,7 +139,7 @@ void CorvaneApp::applicationWillTerminate() {
 void CorvaneApp::showSaveView() {
   if (_saveViewController || !_navController || !_model) return;
   _saveViewController =
-      new CorvaneSaveViewController(_model->getSaveContents(), *this, _environment.model.runLoop, snapshotDirectory());
+      new CorvaneSaveViewController(_model->getSaveContents(), *this, environment_.model.runLoop, snapshotDirectory());
   _navController->presentModalViewController(_saveViewController, true);
 }
 

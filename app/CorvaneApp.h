@@ -35,11 +35,11 @@ struct CorvaneAppEnvironment {
 // Formats dates in local time with a fixed pattern (Qt's date-format syntax).
 class DateFormatter {
  public:
-  explicit DateFormatter(QString pattern) : _pattern(std::move(pattern)) {}
+  explicit DateFormatter(QString pattern) : pattern_(std::move(pattern)) {}
   QString stringFromDate(const Date& date) const;
 
  private:
-  QString _pattern;
+  QString pattern_;
 };
 
 class CorvaneApp final : public QObject,
@@ -87,8 +87,8 @@ class CorvaneApp final : public QObject,
   std::unique_ptr<DateFormatter> _dateFormatter;
   QString _updateMessage;
 
-  CorvaneAppEnvironment _environment;
-  bool _running = false;
+  CorvaneAppEnvironment environment_;
+  bool running_ = false;
 };
 
 }  // namespace corvane

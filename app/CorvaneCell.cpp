@@ -38,41 +38,42 @@ QFont CorvaneCell::measuringFont() { return theme::boldSystemFont(kFontSize); }
 
 CorvaneCell* CorvaneCell::initWithStyleKey(Style style, const QString& reuseIdentifier) {
   auto* cell = new CorvaneCell(style, reuseIdentifier);
-  cell->_key = makeLabel(cell->contentView(), theme::boldSystemFont(kFontSize), theme::kDarkText);
+  cell->key = makeLabel(cell->contentView(), theme::boldSystemFont(kFontSize), theme::kDarkText);
   return cell;
 }
 
 CorvaneCell* CorvaneCell::initWithStyle(Style style, const QString& reuseIdentifier) {
   auto* cell = new CorvaneCell(style, reuseIdentifier);
-  cell->_view = new QScrollArea(cell->contentView());
-  cell->_view->setObjectName(QStringLiteral("ValueScroller"));
-  cell->_view->setFrameShape(QFrame::NoFrame);
-  cell->_view->setHorizontalScrollBarPolicy(Qt::ScrollBarAlwaysOff);
-  cell->_view->setVerticalScrollBarPolicy(Qt::ScrollBarAlwaysOff);
-  cell->_view->setWidgetResizable(false);
-  cell->_view->setFocusPolicy(Qt::NoFocus);
-  cell->_view->viewport()->setAutoFillBackground(false);
-  cell->_scrolledContent = new QWidget;
-  cell->_view->setWidget(cell->_scrolledContent);
+  cell->view = new QScrollArea(cell->contentView());
+  cell->view->setObjectName(QStringLiteral("ValueScroller"));
+  cell->view->setFrameShape(QFrame::NoFrame);
+  cell->view->setHorizontalScrollBarPolicy(Qt::ScrollBarAlwaysOff);
+  cell->view->setVerticalScrollBarPolicy(Qt::ScrollBarAlwaysOff);
+  cell->view->setWidgetResizable(false);
+  cell->view->setFocusPolicy(Qt::NoFocus);
+  cell->view->viewport()->setAutoFillBackground(false);
+  cell->scrolledContent_ = new QWidget;
+  cell->view->setWidget(cell->scrolledContent_);
   // After setWidget, which turns the filling on: the row's own background (and
   // its selection) shows through.
-  cell->_scrolledContent->setAutoFillBackground(false);
-  cell->_key = makeLabel(cell->_scrolledContent, theme::boldSystemFont(kFontSize), theme::kDarkText);
-  cell->_value = makeLabel(cell->_scrolledContent, theme::systemFont(kFontSize), theme::kValueText);
+  cell->scrolledContent_->setAutoFillBackground(false);
+  cell->key = makeLabel(cell->scrolledContent_, theme::boldSystemFont(kFontSize), theme::kDarkText);
+  cell->value = makeLabel(cell->scrolledContent_, theme::systemFont(kFontSize), theme::kValueText);
   return cell;
 }
 
 void CorvaneCell::setLayoutKey() {
-  _arrangement = Arrangement::Key;
+  arrangement_ = Arrangement::Key;
   TableViewCell::layoutSubviews();
-  if (!_key) return;
+  if (!key) return;
   const QRect bounds = contentView()->rect();
-  const QSize key = textSize(QFontMetrics(measuringFont()), _key->text());
-  _key->setGeometry(bounds.x() + kLeftMargin, (bounds.height() - key.height()) / 2, key.width(), key.height());
+  const QSize keySize = textSize(QFontMetrics(measuringFont()), key->text());
+  key->setGeometry(bounds.x() + kLeftMargin, (bounds.height() - keySize.height()) / 2, keySize.width(),
+                   keySize.height());
 }
 
 void CorvaneCell::setLayout() {
-  _arrangement = Arrangement::KeyAndValue;
+  arrangement_ = Arrangement::KeyAndValue;
   TableViewCell::layoutSubviews();
   const QRect bounds = contentView()->rect();
   const int x0 = bounds.x();
@@ -80,28 +81,28 @@ void CorvaneCell::setLayout() {
   const int height = bounds.height();
   const QFontMetrics metrics(measuringFont());
 
-  const QSize key = _key ? textSize(metrics, _key->text()) : QSize();
-  if (_key) _key->setGeometry(x0 + kLeftMargin, (height - key.height()) / 2, key.width(), key.height());
+  const QSize keySize = key ? textSize(metrics, key->text()) : QSize();
+  if (key) key->setGeometry(x0 + kLeftMargin, (height - keySize.height()) / 2, keySize.width(), keySize.height());
 
   // The value is measured in the bold font too, although it is drawn regular.
-  const QSize value = _value ? textSize(metrics, _value->text()) : QSize();
-  const int need = key.width() + kLeftMargin + kGap + value.width();
-  const int valueX = need < width ? width - value.width() : x0 + kLeftMargin + key.width() + kGap;
-  if (_value) {
-    _value->setGeometry(valueX, (height - value.height()) / 2, value.width(), value.height());
+  const QSize valueSize = value ? textSize(metrics, value->text()) : QSize();
+  const int need = keySize.width() + kLeftMargin + kGap + valueSize.width();
+  const int valueX = need < width ? width - valueSize.width() : x0 + kLeftMargin + keySize.width() + kGap;
+  if (value) {
+    value->setGeometry(valueX, (height - valueSize.height()) / 2, valueSize.width(), valueSize.height());
     // The whole value at a glance, for a mouse that cannot scroll sideways.
-    setToolTip(need > width ? _value->text() : QString());
+    setToolTip(need > width ? value->text() : QString());
   }
 
-  if (_view) {
-    const int contentWidth = need > width ? width + key.width() + value.width() : width;
-    _scrolledContent->resize(contentWidth, kScrollViewHeight);
-    _view->setGeometry(bounds.x(), bounds.y(), width, kScrollViewHeight);
+  if (view) {
+    const int contentWidth = need > width ? width + keySize.width() + valueSize.width() : width;
+    scrolledContent_->resize(contentWidth, kScrollViewHeight);
+    view->setGeometry(bounds.x(), bounds.y(), width, kScrollViewHeight);
   }
 }
 
 void CorvaneCell::layoutSubviews() {
-  switch (_arrangement) {
+  switch (arrangement_) {
     case Arrangement::Key: setLayoutKey(); break;
     case Arrangement::KeyAndValue: setLayout(); break;
     case Arrangement::None: TableViewCell::layoutSubviews(); break;

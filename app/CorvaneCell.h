@@ -25,11 +25,12 @@ class CorvaneCell final : public TableViewCell {
   void setLayout();
   using QWidget::setLayout;
 
-  QLabel* key() const { return _key; }
-  // nullptr in a key-only row.
-  QLabel* value() const { return _value; }
-  // nullptr in a key-only row.
-  QScrollArea* view() const { return _view; }
+  // The labels of the row, made by the initialiser: the key, and in a
+  // key/value row the value and the view that scrolls both sideways (nullptr
+  // in a key-only row).
+  QLabel* key = nullptr;
+  QLabel* value = nullptr;
+  QScrollArea* view = nullptr;
 
   // The font that measures the key, and the value too.
   static QFont measuringFont();
@@ -43,11 +44,8 @@ class CorvaneCell final : public TableViewCell {
   CorvaneCell(Style style, const QString& reuseIdentifier);
   static QLabel* makeLabel(QWidget* parent, const QFont& font, const QColor& colour);
 
-  QLabel* _key = nullptr;
-  QLabel* _value = nullptr;
-  QScrollArea* _view = nullptr;
-  QWidget* _scrolledContent = nullptr;
-  Arrangement _arrangement = Arrangement::None;
+  QWidget* scrolledContent_ = nullptr;
+  Arrangement arrangement_ = Arrangement::None;
 };
 
 }  // namespace corvane

@@ -18,15 +18,15 @@ constexpr int kStatusFontSize = 14;
 
 CorvanePaneController::CorvanePaneController(NodeRef node, std::string path, ScreenHost& application)
     : _nodes(std::move(node)), _keyPath(std::move(path)), _status(QStringLiteral("")), _isLoading(true),
-      _application(application) {
+      application_(application) {
   setObjectName(QStringLiteral("CorvanePaneController"));
   auto* layout = new QVBoxLayout(this);
   layout->setContentsMargins(0, 0, 0, 0);
-  _tableView = new TableView(this);
-  _tableView->setDataSource(this);
-  layout->addWidget(_tableView);
+  tableView_ = new TableView(this);
+  tableView_->setDataSource(this);
+  layout->addWidget(tableView_);
   updateTitle();
-  _tableView->reloadData();
+  tableView_->reloadData();
 }
 
 void CorvanePaneController::createToolbarItems() {
@@ -49,7 +49,7 @@ void CorvanePaneController::createToolbarItems() {
   status->adjustSize();
 
   std::vector<BarItem> items{BarItem::item(indicator), BarItem::item(status), BarItem::flexibleSpace()};
-  if (_application.allowSaveButton()) {
+  if (application_.allowSaveButton()) {
     auto* save = new QToolButton(toolbar());
     save->setObjectName(QStringLiteral("SaveButton"));
     save->setText(tr("Save"));
@@ -59,7 +59,7 @@ void CorvanePaneController::createToolbarItems() {
     save->setFont(theme::systemFont(15));
     save->setCursor(Qt::PointingHandCursor);
     save->setAutoRaise(true);
-    connect(save, &QToolButton::clicked, this, [this] { _application.showSaveView(); });
+    connect(save, &QToolButton::clicked, this, [this] { application_.showSaveView(); });
     items.push_back(BarItem::item(save));
   }
   setToolbarItems(std::move(items), true);
@@ -71,7 +71,7 @@ void CorvanePaneController::viewWillAppear(bool animated) {
   if (NavigationController* navigation = navigationController()) navigation->setToolbarHidden(false);
   createToolbarItems();
   // Coming back to a screen shows it without the row that was opened.
-  if (const auto selected = _tableView->indexPathForSelectedRow()) _tableView->deselectRowAtIndexPath(*selected, false);
+  if (const auto selected = tableView_->indexPathForSelectedRow()) tableView_->deselectRowAtIndexPath(*selected, false);
 }
 
 void CorvanePaneController::setStatus(const std::optional<QString>& status, bool isLoading) {
@@ -83,7 +83,7 @@ void CorvanePaneController::setStatus(const std::optional<QString>& status, bool
 void CorvanePaneController::reloadWithNode(NodeRef node) {
   _nodes = std::move(node);
   updateTitle();
-  _tableView->reloadData();
+  tableView_->reloadData();
   createToolbarItems();
 }
 
@@ -119,15 +119,15 @@ TableViewCell* CorvanePaneController::tableViewCellForRowAtIndexPath(TableView& 
 
   if (node.childNodes()) {
     if (!cell) cell = CorvaneCell::initWithStyleKey(TableViewCell::Style::Value1, identifier);
-    cell->key()->setText(name);
+    cell->key->setText(name);
     cell->setAccessoryType(TableViewCell::AccessoryType::DisclosureIndicator);
-    if (cell->value()) cell->value()->setText(QString());
+    if (cell->value) cell->value->setText(QString());
     cell->setLayoutKey();
   } else {
     if (!cell) cell = CorvaneCell::initWithStyle(TableViewCell::Style::Value1, identifier);
-    cell->key()->setText(name);
+    cell->key->setText(name);
     cell->setAccessoryType(TableViewCell::AccessoryType::None);
-    if (cell->value()) cell->value()->setText(node.value() ? QString::fromStdString(*node.value()) : QString());
+    if (cell->value) cell->value->setText(node.value() ? QString::fromStdString(*node.value()) : QString());
     cell->setLayout();
   }
   return cell;
@@ -143,7 +143,7 @@ void CorvanePaneController::tableViewDidSelectRowAtIndexPath(TableView& tableVie
     return;
   }
   auto* screen = new CorvanePaneController(*child, appendPathComponent(_keyPath, (*child)->displayName()),
-                                           _application);
+                                           application_);
   screen->setStatus(_status, _isLoading);
   if (NavigationController* navigation = navigationController()) {
     navigation->pushViewController(screen, true);

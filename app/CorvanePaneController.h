@@ -42,7 +42,7 @@ class CorvanePaneController final : public ViewController, private TableViewData
   const NodeRef& node() const { return _nodes; }
   const QString& status() const { return _status; }
   bool isLoading() const { return _isLoading; }
-  TableView* tableView() const { return _tableView; }
+  TableView* tableView() const { return tableView_; }
 
  private:
   void updateTitle();
@@ -53,8 +53,8 @@ class CorvanePaneController final : public ViewController, private TableViewData
   QString _status;
   bool _isLoading = true;
 
-  ScreenHost& _application;
-  TableView* _tableView;
+  ScreenHost& application_;
+  TableView* tableView_;
 };
 
 }  // namespace corvane

@@ -38,56 +38,56 @@ bool writeFile(const std::string& path, const Bytes& bytes) {
 CorvaneSaveViewController::CorvaneSaveViewController(const Value& saveHistory, ScreenHost& application,
                                                      RunLoop& mainQueue, std::filesystem::path snapshotDirectory)
     : _timeStamp(currentDate()), _saveHistory(saveHistory.deepCopy()),
-      _ui(std::make_unique<Ui::CorvaneSaveViewController>()), _application(application), _mainQueue(mainQueue),
-      _snapshotDirectory(std::move(snapshotDirectory)) {
-  _ui->setupUi(this);
+      ui_(std::make_unique<Ui::CorvaneSaveViewController>()), application_(application), mainQueue_(mainQueue),
+      snapshotDirectory_(std::move(snapshotDirectory)) {
+  ui_->setupUi(this);
   setObjectName(QStringLiteral("CorvaneSaveViewController"));
-  setTitle(_ui->titleLabel->text());
+  setTitle(ui_->titleLabel->text());
   viewDidLoad();
 }
 
 CorvaneSaveViewController::~CorvaneSaveViewController() = default;
 
 void CorvaneSaveViewController::viewDidLoad() {
-  connect(_ui->saveDescription, &QLineEdit::returnPressed, this,
-          [this] { textFieldShouldReturn(_ui->saveDescription); });
-  connect(_ui->saveButton, &QPushButton::clicked, this, &CorvaneSaveViewController::savePressed);
-  connect(_ui->cancelButton, &QPushButton::clicked, this, &CorvaneSaveViewController::cancelPressed);
+  connect(ui_->saveDescription, &QLineEdit::returnPressed, this,
+          [this] { textFieldShouldReturn(ui_->saveDescription); });
+  connect(ui_->saveButton, &QPushButton::clicked, this, &CorvaneSaveViewController::savePressed);
+  connect(ui_->cancelButton, &QPushButton::clicked, this, &CorvaneSaveViewController::cancelPressed);
 
-  _ui->header->setObjectName(QStringLiteral("NavigationBar"));
-  _ui->header->setAttribute(Qt::WA_StyledBackground, true);
-  _ui->titleLabel->setFont(theme::boldSystemFont(17));
-  for (QPushButton* button : {_ui->cancelButton, _ui->saveButton}) {
+  ui_->header->setObjectName(QStringLiteral("NavigationBar"));
+  ui_->header->setAttribute(Qt::WA_StyledBackground, true);
+  ui_->titleLabel->setFont(theme::boldSystemFont(17));
+  for (QPushButton* button : {ui_->cancelButton, ui_->saveButton}) {
     button->setFont(theme::systemFont(17));
     button->setCursor(Qt::PointingHandCursor);
   }
-  _ui->saveButton->setObjectName(QStringLiteral("SaveSnapshotButton"));
-  _ui->cancelButton->setObjectName(QStringLiteral("CancelSnapshotButton"));
-  styleHeading(_ui->descriptionHeading);
-  styleHeading(_ui->contentsHeading);
-  _ui->saveDescription->setFont(theme::systemFont(15));
-  _ui->saveDescription->setMinimumHeight(36);
-  _ui->destinationLabel->setFont(theme::systemFont(12));
-  QPalette secondary = _ui->destinationLabel->palette();
+  ui_->saveButton->setObjectName(QStringLiteral("SaveSnapshotButton"));
+  ui_->cancelButton->setObjectName(QStringLiteral("CancelSnapshotButton"));
+  styleHeading(ui_->descriptionHeading);
+  styleHeading(ui_->contentsHeading);
+  ui_->saveDescription->setFont(theme::systemFont(15));
+  ui_->saveDescription->setMinimumHeight(36);
+  ui_->destinationLabel->setFont(theme::systemFont(12));
+  QPalette secondary = ui_->destinationLabel->palette();
   secondary.setColor(QPalette::WindowText, theme::kSecondaryText);
-  _ui->destinationLabel->setPalette(secondary);
-  _ui->destinationLabel->setText(
+  ui_->destinationLabel->setPalette(secondary);
+  ui_->destinationLabel->setText(
       tr("Written to %1 as CorvaneSnapshot-<seconds since 1970>.corvane, an XML property list.")
-          .arg(QString::fromStdString(_snapshotDirectory.string())));
-  _ui->body->setAutoFillBackground(true);
-  QPalette group = _ui->body->palette();
+          .arg(QString::fromStdString(snapshotDirectory_.string())));
+  ui_->body->setAutoFillBackground(true);
+  QPalette group = ui_->body->palette();
   group.setColor(QPalette::Window, theme::kGroupBackground);
-  _ui->body->setPalette(group);
+  ui_->body->setPalette(group);
 
-  _ui->saveContentTable->setDataSource(this);
-  _ui->saveContentTable->reloadData();
-  _ui->saveContentTable->sizeToFit();
+  ui_->saveContentTable->setDataSource(this);
+  ui_->saveContentTable->reloadData();
+  ui_->saveContentTable->sizeToFit();
 }
 
 void CorvaneSaveViewController::viewWillAppear(bool animated) {
   ViewController::viewWillAppear(animated);
   // Now inside the window, the list has the window's style and its final frame.
-  _ui->saveContentTable->sizeToFit();
+  ui_->saveContentTable->sizeToFit();
 }
 
 const Array* CorvaneSaveViewController::entries() const { return _saveHistory.asArray(); }
@@ -98,7 +98,7 @@ std::string CorvaneSaveViewController::snapshotFileAt(const Date& date) const {
   if (date.microsecondsSince1970 % 1'000'000 < 0) --seconds;
   char name[64];
   std::snprintf(name, sizeof name, "CorvaneSnapshot-%ld.corvane", static_cast<long>(seconds));
-  return _snapshotDirectory.string() + "/" + name;
+  return snapshotDirectory_.string() + "/" + name;
 }
 
 void CorvaneSaveViewController::savePressed() {
@@ -107,7 +107,7 @@ void CorvaneSaveViewController::savePressed() {
   snapshot.set("Timestamp", Value(dateText(_timeStamp)));
   if (!_saveHistory.isNull()) {
     snapshot.set("Data", _saveHistory);
-    snapshot.set("Description", Value(_ui->saveDescription->text().toStdString()));
+    snapshot.set("Description", Value(ui_->saveDescription->text().toStdString()));
   }
 
   const std::string file = snapshotFileAt(currentDate());
@@ -131,8 +131,8 @@ void CorvaneSaveViewController::cancelPressed() { requestClose(); }
 
 void CorvaneSaveViewController::requestClose() {
   // Later, on the main queue: the button that asked is still on the call stack.
-  _mainQueue.dispatchAsync([self = QPointer<CorvaneSaveViewController>(this)] {
-    if (self) self->_application.closeSaveView();
+  mainQueue_.dispatchAsync([self = QPointer<CorvaneSaveViewController>(this)] {
+    if (self) self->application_.closeSaveView();
   });
 }
 
@@ -141,7 +141,7 @@ bool CorvaneSaveViewController::textFieldShouldReturn(QLineEdit* textField) {
   return true;
 }
 
-void CorvaneSaveViewController::backgroundTouched() { _ui->saveDescription->clearFocus(); }
+void CorvaneSaveViewController::backgroundTouched() { ui_->saveDescription->clearFocus(); }
 
 void CorvaneSaveViewController::mousePressEvent(QMouseEvent* event) {
   backgroundTouched();
@@ -192,9 +192,9 @@ void CorvaneSaveViewController::tableViewDidSelectRowAtIndexPath(TableView& tabl
   backgroundTouched();
 }
 
-TableView* CorvaneSaveViewController::saveContentTable() const { return _ui->saveContentTable; }
-QLineEdit* CorvaneSaveViewController::saveDescription() const { return _ui->saveDescription; }
-QPushButton* CorvaneSaveViewController::saveButton() const { return _ui->saveButton; }
-QPushButton* CorvaneSaveViewController::cancelButton() const { return _ui->cancelButton; }
+TableView* CorvaneSaveViewController::saveContentTable() const { return ui_->saveContentTable; }
+QLineEdit* CorvaneSaveViewController::saveDescription() const { return ui_->saveDescription; }
+QPushButton* CorvaneSaveViewController::saveButton() const { return ui_->saveButton; }
+QPushButton* CorvaneSaveViewController::cancelButton() const { return ui_->cancelButton; }
 
 }  // namespace corvane

@@ -69,10 +69,10 @@ class CorvaneSaveViewController final : public ViewController, private TableView
 
   Date _timeStamp;
   Value _saveHistory;
-  std::unique_ptr<Ui::CorvaneSaveViewController> _ui;
-  ScreenHost& _application;
-  RunLoop& _mainQueue;
-  std::filesystem::path _snapshotDirectory;
+  std::unique_ptr<Ui::CorvaneSaveViewController> ui_;
+  ScreenHost& application_;
+  RunLoop& mainQueue_;
+  std::filesystem::path snapshotDirectory_;
 };
 
 }  // namespace corvane

@@ -56,27 +56,27 @@ QWidget* makeBar(const char* objectName, QWidget* parent) {
 // --- ViewController ----------------------------------------------------------
 
 ViewController::ViewController(QWidget* parent) : QWidget(parent) {
-  _toolbar = makeBar("Toolbar", this);
-  _toolbar->hide();
-  _toolbar->setFixedHeight(kToolbarHeight);
-  _toolbarLayout = new QHBoxLayout(_toolbar);
-  _toolbarLayout->setContentsMargins(12, 0, 8, 0);
-  _toolbarLayout->setSpacing(8);
+  toolbar_ = makeBar("Toolbar", this);
+  toolbar_->hide();
+  toolbar_->setFixedHeight(kToolbarHeight);
+  toolbarLayout_ = new QHBoxLayout(toolbar_);
+  toolbarLayout_->setContentsMargins(12, 0, 8, 0);
+  toolbarLayout_->setSpacing(8);
 }
 
 ViewController::~ViewController() {
   // While this screen is on a stack, its toolbar lives in the stack's toolbar area.
-  delete _toolbar.data();
+  delete toolbar_.data();
 }
 
 void ViewController::setTitle(const QString& title) {
-  if (title == _title) return;
-  _title = title;
-  emit titleChanged(_title);
+  if (title == title_) return;
+  title_ = title;
+  emit titleChanged(title_);
 }
 
 void ViewController::setToolbarItems(std::vector<BarItem> items, bool /*animated*/) {
-  while (QLayoutItem* old = _toolbarLayout->takeAt(0)) {
+  while (QLayoutItem* old = toolbarLayout_->takeAt(0)) {
     if (QWidget* widget = old->widget()) {
       // Deleted later: the call may come from one of these very widgets.
       widget->hide();
@@ -84,12 +84,12 @@ void ViewController::setToolbarItems(std::vector<BarItem> items, bool /*animated
     }
     delete old;
   }
-  _toolbarItems = std::move(items);
-  for (const BarItem& item : _toolbarItems) {
+  toolbarItems_ = std::move(items);
+  for (const BarItem& item : toolbarItems_) {
     if (item.kind == BarItem::Kind::FlexibleSpace) {
-      _toolbarLayout->addStretch(1);
+      toolbarLayout_->addStretch(1);
     } else if (item.widget) {
-      _toolbarLayout->addWidget(item.widget, 0, Qt::AlignVCenter);
+      toolbarLayout_->addWidget(item.widget, 0, Qt::AlignVCenter);
       // Shown now rather than when the layout gets to it, unless hidden on purpose.
       const bool hiddenOnPurpose =
           item.widget->isHidden() && item.widget->testAttribute(Qt::WA_WState_ExplicitShowHide);
@@ -105,84 +105,84 @@ void ViewController::viewWillDisappear(bool) {}
 
 NavigationController::NavigationController(ViewController* rootViewController, QWidget* parent) : QWidget(parent) {
   setObjectName(QStringLiteral("NavigationController"));
-  _presentation = new QStackedLayout(this);
-  _presentation->setContentsMargins(0, 0, 0, 0);
+  presentation_ = new QStackedLayout(this);
+  presentation_->setContentsMargins(0, 0, 0, 0);
 
-  _stackPage = new QWidget(this);
-  auto* page = new QVBoxLayout(_stackPage);
+  stackPage_ = new QWidget(this);
+  auto* page = new QVBoxLayout(stackPage_);
   page->setContentsMargins(0, 0, 0, 0);
   page->setSpacing(0);
 
-  _navigationBar = makeBar("NavigationBar", _stackPage);
-  _navigationBar->setFixedHeight(kNavigationBarHeight);
-  auto* bar = new QHBoxLayout(_navigationBar);
+  navigationBar_ = makeBar("NavigationBar", stackPage_);
+  navigationBar_->setFixedHeight(kNavigationBarHeight);
+  auto* bar = new QHBoxLayout(navigationBar_);
   bar->setContentsMargins(4, 0, 4, 0);
   bar->setSpacing(0);
-  _backButton = new QToolButton(_navigationBar);
-  _backButton->setObjectName(QStringLiteral("BackButton"));
-  _backButton->setFont(theme::systemFont(17));
-  _backButton->setCursor(Qt::PointingHandCursor);
-  _backButton->setAutoRaise(true);
-  _backButton->setFocusPolicy(Qt::NoFocus);
-  connect(_backButton, &QToolButton::clicked, this, [this] { popViewControllerAnimated(true); });
-  _titleLabel = new TitleLabel(_navigationBar);
-  _titleLabel->setObjectName(QStringLiteral("NavigationTitle"));
-  _titleLabel->setFont(theme::boldSystemFont(17));
-  _titleLabel->setAlignment(Qt::AlignCenter);
-  _titleLabel->setTextFormat(Qt::PlainText);
+  backButton_ = new QToolButton(navigationBar_);
+  backButton_->setObjectName(QStringLiteral("BackButton"));
+  backButton_->setFont(theme::systemFont(17));
+  backButton_->setCursor(Qt::PointingHandCursor);
+  backButton_->setAutoRaise(true);
+  backButton_->setFocusPolicy(Qt::NoFocus);
+  connect(backButton_, &QToolButton::clicked, this, [this] { popViewControllerAnimated(true); });
+  titleLabel_ = new TitleLabel(navigationBar_);
+  titleLabel_->setObjectName(QStringLiteral("NavigationTitle"));
+  titleLabel_->setFont(theme::boldSystemFont(17));
+  titleLabel_->setAlignment(Qt::AlignCenter);
+  titleLabel_->setTextFormat(Qt::PlainText);
   // A long title is clipped, never widening the window (section names such as
   // "Connected mode LTE Intra-frequency Measurement" are wider than a phone).
-  _titleLabel->setSizePolicy(QSizePolicy::Ignored, QSizePolicy::Preferred);
-  _titleBalance = new QWidget(_navigationBar);
-  bar->addWidget(_backButton);
-  bar->addWidget(_titleLabel, 1);
-  bar->addWidget(_titleBalance);
+  titleLabel_->setSizePolicy(QSizePolicy::Ignored, QSizePolicy::Preferred);
+  titleBalance_ = new QWidget(navigationBar_);
+  bar->addWidget(backButton_);
+  bar->addWidget(titleLabel_, 1);
+  bar->addWidget(titleBalance_);
 
-  _screens = new QStackedWidget(_stackPage);
-  _toolbars = new QStackedWidget(_stackPage);
-  _toolbars->setFixedHeight(kToolbarHeight);
-  _toolbars->hide();
+  screens_ = new QStackedWidget(stackPage_);
+  toolbars_ = new QStackedWidget(stackPage_);
+  toolbars_->setFixedHeight(kToolbarHeight);
+  toolbars_->hide();
 
-  page->addWidget(_navigationBar);
-  page->addWidget(_screens, 1);
-  page->addWidget(_toolbars);
-  _presentation->addWidget(_stackPage);
+  page->addWidget(navigationBar_);
+  page->addWidget(screens_, 1);
+  page->addWidget(toolbars_);
+  presentation_->addWidget(stackPage_);
 
   // Desktop habits for going back: Alt+Left and Backspace.
   for (const QKeySequence& keys : {QKeySequence(QKeySequence::Back), QKeySequence(Qt::Key_Backspace)}) {
-    auto* shortcut = new QShortcut(keys, _stackPage);
+    auto* shortcut = new QShortcut(keys, stackPage_);
     shortcut->setContext(Qt::WidgetWithChildrenShortcut);
     connect(shortcut, &QShortcut::activated, this, [this] { popViewControllerAnimated(true); });
   }
 
   adopt(rootViewController);
-  _viewControllers.push_back(rootViewController);
-  _screens->setCurrentWidget(rootViewController);
-  _toolbars->setCurrentWidget(rootViewController->toolbar());
+  viewControllers_.push_back(rootViewController);
+  screens_->setCurrentWidget(rootViewController);
+  toolbars_->setCurrentWidget(rootViewController->toolbar());
   updateBar();
 }
 
 NavigationController::~NavigationController() = default;
 
 void NavigationController::adopt(ViewController* viewController) {
-  viewController->_navigationController = this;
-  _screens->addWidget(viewController);
-  _toolbars->addWidget(viewController->toolbar());
+  viewController->navigationController_ = this;
+  screens_->addWidget(viewController);
+  toolbars_->addWidget(viewController->toolbar());
   viewController->toolbar()->show();
   connect(viewController, &ViewController::titleChanged, this, &NavigationController::updateBar);
 }
 
 void NavigationController::release(ViewController* viewController) {
   disconnect(viewController, nullptr, this, nullptr);
-  _screens->removeWidget(viewController);
-  if (viewController->toolbar()) _toolbars->removeWidget(viewController->toolbar());
+  screens_->removeWidget(viewController);
+  if (viewController->toolbar()) toolbars_->removeWidget(viewController->toolbar());
   viewController->hide();
   // Deleted later: the back button or a screen's own handler may be on the call stack.
   viewController->deleteLater();
 }
 
 void NavigationController::willShow(ViewController* viewController, bool animated) {
-  if (_delegate) _delegate->navigationControllerWillShowViewController(*this, viewController, animated);
+  if (delegate_) delegate_->navigationControllerWillShowViewController(*this, viewController, animated);
   viewController->viewWillAppear(animated);
 }
 
@@ -190,60 +190,60 @@ void NavigationController::pushViewController(ViewController* viewController, bo
   if (!viewController) return;
   topViewController()->viewWillDisappear(animated);
   adopt(viewController);
-  _viewControllers.push_back(viewController);
+  viewControllers_.push_back(viewController);
   willShow(viewController, animated);
-  _screens->setCurrentWidget(viewController);
-  _toolbars->setCurrentWidget(viewController->toolbar());
+  screens_->setCurrentWidget(viewController);
+  toolbars_->setCurrentWidget(viewController->toolbar());
   updateBar();
 }
 
 void NavigationController::popViewControllerAnimated(bool animated) {
-  if (_viewControllers.size() < 2) return;
-  popToViewController(_viewControllers[_viewControllers.size() - 2], animated);
+  if (viewControllers_.size() < 2) return;
+  popToViewController(viewControllers_[viewControllers_.size() - 2], animated);
 }
 
 void NavigationController::popToViewController(ViewController* viewController, bool animated) {
-  const auto found = std::find(_viewControllers.begin(), _viewControllers.end(), viewController);
-  if (found == _viewControllers.end() || found + 1 == _viewControllers.end()) return;
+  const auto found = std::find(viewControllers_.begin(), viewControllers_.end(), viewController);
+  if (found == viewControllers_.end() || found + 1 == viewControllers_.end()) return;
   topViewController()->viewWillDisappear(animated);
-  std::vector<ViewController*> popped(found + 1, _viewControllers.end());
-  _viewControllers.erase(found + 1, _viewControllers.end());
+  std::vector<ViewController*> popped(found + 1, viewControllers_.end());
+  viewControllers_.erase(found + 1, viewControllers_.end());
   willShow(viewController, animated);
-  _screens->setCurrentWidget(viewController);
-  _toolbars->setCurrentWidget(viewController->toolbar());
+  screens_->setCurrentWidget(viewController);
+  toolbars_->setCurrentWidget(viewController->toolbar());
   for (ViewController* gone : popped) release(gone);
   updateBar();
 }
 
 void NavigationController::setToolbarHidden(bool hidden) {
-  _toolbarHidden = hidden;
-  _toolbars->setVisible(!hidden);
+  toolbarHidden_ = hidden;
+  toolbars_->setVisible(!hidden);
 }
 
 void NavigationController::presentModalViewController(ViewController* viewController, bool animated) {
-  if (!viewController || _modalViewController) return;
-  _modalViewController = viewController;
-  viewController->_navigationController = this;
-  _presentation->addWidget(viewController);
+  if (!viewController || modalViewController_) return;
+  modalViewController_ = viewController;
+  viewController->navigationController_ = this;
+  presentation_->addWidget(viewController);
   viewController->viewWillAppear(animated);
-  _presentation->setCurrentWidget(viewController);
+  presentation_->setCurrentWidget(viewController);
 }
 
 void NavigationController::dismissModalViewControllerAnimated(bool animated) {
-  ViewController* presented = _modalViewController;
+  ViewController* presented = modalViewController_;
   if (!presented) return;
-  _modalViewController = nullptr;
+  modalViewController_ = nullptr;
   presented->viewWillDisappear(animated);
-  _presentation->setCurrentWidget(_stackPage);
-  _presentation->removeWidget(presented);
+  presentation_->setCurrentWidget(stackPage_);
+  presentation_->removeWidget(presented);
   presented->hide();
   presented->deleteLater();
 }
 
-QString NavigationController::barTitle() const { return _titleLabel->text(); }
+QString NavigationController::barTitle() const { return titleLabel_->text(); }
 
 QString NavigationController::backButtonText() const {
-  return _backButton->isHidden() ? QString() : _backButton->text();
+  return backButton_->isHidden() ? QString() : backButton_->text();
 }
 
 void NavigationController::resizeEvent(QResizeEvent* event) {
@@ -253,32 +253,32 @@ void NavigationController::resizeEvent(QResizeEvent* event) {
 
 void NavigationController::showEvent(QShowEvent* event) {
   QWidget::showEvent(event);
-  if (_appeared) return;
+  if (appeared_) return;
   // The root appears with the stack, without a "will show" to the delegate.
-  _appeared = true;
+  appeared_ = true;
   topViewController()->viewWillAppear(false);
 }
 
 void NavigationController::updateBar() {
-  _titleLabel->setText(topViewController()->title());
-  _titleLabel->setToolTip(topViewController()->title());
-  if (_viewControllers.size() < 2) {
-    _backButton->hide();
-    _titleBalance->setFixedWidth(0);
+  titleLabel_->setText(topViewController()->title());
+  titleLabel_->setToolTip(topViewController()->title());
+  if (viewControllers_.size() < 2) {
+    backButton_->hide();
+    titleBalance_->setFixedWidth(0);
     return;
   }
-  const QString previous = _viewControllers[_viewControllers.size() - 2]->title();
+  const QString previous = viewControllers_[viewControllers_.size() - 2]->title();
   const QString full = QStringLiteral("\u2039 ") + (previous.isEmpty() ? tr("Back") : previous);
   // The back button keeps room for the title: a long name is cut short.
-  _backButton->setText(QFontMetrics(_backButton->font()).elidedText(full, Qt::ElideRight, kMaximumBackTextWidth));
-  _backButton->setToolTip(full);
-  _backButton->show();
+  backButton_->setText(QFontMetrics(backButton_->font()).elidedText(full, Qt::ElideRight, kMaximumBackTextWidth));
+  backButton_->setToolTip(full);
+  backButton_->show();
   // The balance keeps the title centred while there is room; a long title
   // takes the balance's room first.
-  const int back = _backButton->sizeHint().width();
-  const int title = QFontMetrics(_titleLabel->font()).horizontalAdvance(_titleLabel->text());
-  const int room = _navigationBar->width() - 8 - back;
-  _titleBalance->setFixedWidth(std::clamp(room - title, 0, back));
+  const int back = backButton_->sizeHint().width();
+  const int title = QFontMetrics(titleLabel_->font()).horizontalAdvance(titleLabel_->text());
+  const int room = navigationBar_->width() - 8 - back;
+  titleBalance_->setFixedWidth(std::clamp(room - title, 0, back));
 }
 
 }  // namespace corvane

@@ -41,18 +41,18 @@ class ViewController : public QWidget {
   explicit ViewController(QWidget* parent = nullptr);
   ~ViewController() override;
 
-  const QString& title() const { return _title; }
+  const QString& title() const { return title_; }
   void setTitle(const QString& title);
 
-  const std::vector<BarItem>& toolbarItems() const { return _toolbarItems; }
+  const std::vector<BarItem>& toolbarItems() const { return toolbarItems_; }
   // Replaces the toolbar's items; the widgets of the previous items are deleted.
   void setToolbarItems(std::vector<BarItem> items, bool animated);
   // The toolbar that shows the items (the navigation controller shows it while
   // this screen is on top). Item widgets are best made as its children.
-  QWidget* toolbar() const { return _toolbar; }
+  QWidget* toolbar() const { return toolbar_; }
 
   // The stack this screen is on (or is presented over); nullptr for none.
-  NavigationController* navigationController() const { return _navigationController; }
+  NavigationController* navigationController() const { return navigationController_; }
 
   virtual void viewWillAppear(bool animated);
   virtual void viewWillDisappear(bool animated);
@@ -63,11 +63,11 @@ class ViewController : public QWidget {
  private:
   friend class NavigationController;
 
-  QString _title;
-  std::vector<BarItem> _toolbarItems;
-  QPointer<QWidget> _toolbar;
-  QHBoxLayout* _toolbarLayout = nullptr;
-  NavigationController* _navigationController = nullptr;
+  QString title_;
+  std::vector<BarItem> toolbarItems_;
+  QPointer<QWidget> toolbar_;
+  QHBoxLayout* toolbarLayout_ = nullptr;
+  NavigationController* navigationController_ = nullptr;
 };
 
 class NavigationControllerDelegate {
@@ -88,8 +88,8 @@ class NavigationController final : public QWidget {
   explicit NavigationController(ViewController* rootViewController, QWidget* parent = nullptr);
   ~NavigationController() override;
 
-  void setDelegate(NavigationControllerDelegate* delegate) { _delegate = delegate; }
-  NavigationControllerDelegate* delegate() const { return _delegate; }
+  void setDelegate(NavigationControllerDelegate* delegate) { delegate_ = delegate; }
+  NavigationControllerDelegate* delegate() const { return delegate_; }
 
   // Takes the screen over and shows it on top.
   void pushViewController(ViewController* viewController, bool animated);
@@ -98,23 +98,23 @@ class NavigationController final : public QWidget {
   // Pops every screen above `viewController`.
   void popToViewController(ViewController* viewController, bool animated);
 
-  const std::vector<ViewController*>& viewControllers() const { return _viewControllers; }
-  ViewController* topViewController() const { return _viewControllers.back(); }
+  const std::vector<ViewController*>& viewControllers() const { return viewControllers_; }
+  ViewController* topViewController() const { return viewControllers_.back(); }
 
   void setToolbarHidden(bool hidden);
-  bool isToolbarHidden() const { return _toolbarHidden; }
+  bool isToolbarHidden() const { return toolbarHidden_; }
 
   // Shows `viewController` over the whole stack (taking it over) until it is dismissed.
   void presentModalViewController(ViewController* viewController, bool animated);
   // Takes the presented screen away and deletes it.
   void dismissModalViewControllerAnimated(bool animated);
-  ViewController* modalViewController() const { return _modalViewController; }
+  ViewController* modalViewController() const { return modalViewController_; }
 
   // What the bar shows: the top screen's title, and the back button's text
   // (empty when the root is on top).
   QString barTitle() const;
   QString backButtonText() const;
-  QToolButton* backButton() const { return _backButton; }
+  QToolButton* backButton() const { return backButton_; }
 
  protected:
   void showEvent(QShowEvent* event) override;
@@ -126,20 +126,20 @@ class NavigationController final : public QWidget {
   void release(ViewController* viewController);
   void updateBar();
 
-  std::vector<ViewController*> _viewControllers;
-  NavigationControllerDelegate* _delegate = nullptr;
-  ViewController* _modalViewController = nullptr;
-  bool _toolbarHidden = true;
-  bool _appeared = false;
+  std::vector<ViewController*> viewControllers_;
+  NavigationControllerDelegate* delegate_ = nullptr;
+  ViewController* modalViewController_ = nullptr;
+  bool toolbarHidden_ = true;
+  bool appeared_ = false;
 
-  QStackedLayout* _presentation = nullptr;  // the stack's page, or the modal screen
-  QWidget* _stackPage = nullptr;
-  QWidget* _navigationBar = nullptr;
-  QToolButton* _backButton = nullptr;
-  QLabel* _titleLabel = nullptr;
-  QWidget* _titleBalance = nullptr;
-  QStackedWidget* _screens = nullptr;
-  QStackedWidget* _toolbars = nullptr;
+  QStackedLayout* presentation_ = nullptr;  // the stack's page, or the modal screen
+  QWidget* stackPage_ = nullptr;
+  QWidget* navigationBar_ = nullptr;
+  QToolButton* backButton_ = nullptr;
+  QLabel* titleLabel_ = nullptr;
+  QWidget* titleBalance_ = nullptr;
+  QStackedWidget* screens_ = nullptr;
+  QStackedWidget* toolbars_ = nullptr;
 };
 
 }  // namespace corvane

@@ -9,7 +9,7 @@
 
 namespace corvane {
 
-Preferences::Preferences(QString directory) : _directory(std::move(directory)) {}
+Preferences::Preferences(QString directory) : directory_(std::move(directory)) {}
 
 Preferences::~Preferences() = default;
 
@@ -18,11 +18,11 @@ QString Preferences::defaultDirectory() {
 }
 
 QString Preferences::fileForDomain(const QString& domain) const {
-  return QDir(_directory).filePath(domain + QStringLiteral(".conf"));
+  return QDir(directory_).filePath(domain + QStringLiteral(".conf"));
 }
 
 QSettings& Preferences::settings(const QString& domain) {
-  std::unique_ptr<QSettings>& slot = _settings[domain];
+  std::unique_ptr<QSettings>& slot = settings_[domain];
   if (!slot) slot = std::make_unique<QSettings>(fileForDomain(domain), QSettings::IniFormat);
   return *slot;
 }
@@ -54,7 +54,7 @@ void Preferences::setAppValue(const QString& key, const QVariant& value, const Q
 }
 
 bool Preferences::synchronize(const QString& domain) {
-  QDir().mkpath(_directory);
+  QDir().mkpath(directory_);
   QSettings& domainSettings = settings(domain);
   domainSettings.sync();
   if (domainSettings.status() != QSettings::NoError) {

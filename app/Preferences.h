@@ -49,8 +49,8 @@ class Preferences {
  private:
   QSettings& settings(const QString& domain);
 
-  QString _directory;
-  std::map<QString, std::unique_ptr<QSettings>> _settings;
+  QString directory_;
+  std::map<QString, std::unique_ptr<QSettings>> settings_;
 };
 
 }  // namespace corvane

@@ -21,47 +21,47 @@ constexpr int kSeparatorInset = 10;
 // --- TableViewCell -----------------------------------------------------------
 
 TableViewCell::TableViewCell(Style style, QString reuseIdentifier, QWidget* parent)
-    : QWidget(parent), _style(style), _reuseIdentifier(std::move(reuseIdentifier)) {
+    : QWidget(parent), style_(style), reuseIdentifier_(std::move(reuseIdentifier)) {
   setAttribute(Qt::WA_OpaquePaintEvent, false);
   setFixedHeight(kHeight);
   setCursor(Qt::PointingHandCursor);
-  _contentView = new QWidget(this);
-  _contentView->setObjectName(QStringLiteral("ContentView"));
-  _accessory = new QLabel(this);
-  _accessory->hide();
+  contentView_ = new QWidget(this);
+  contentView_->setObjectName(QStringLiteral("ContentView"));
+  accessory_ = new QLabel(this);
+  accessory_->hide();
 }
 
 QLabel* TableViewCell::textLabel() {
-  if (!_textLabel) {
-    _textLabel = new QLabel(_contentView);
-    _textLabel->setTextFormat(Qt::PlainText);
-    _textLabel->setFont(theme::systemFont(17));
-    QPalette palette = _textLabel->palette();
+  if (!textLabel_) {
+    textLabel_ = new QLabel(contentView_);
+    textLabel_->setTextFormat(Qt::PlainText);
+    textLabel_->setFont(theme::systemFont(17));
+    QPalette palette = textLabel_->palette();
     palette.setColor(QPalette::WindowText, theme::kDarkText);
-    _textLabel->setPalette(palette);
+    textLabel_->setPalette(palette);
     layoutSubviews();
   }
-  return _textLabel;
+  return textLabel_;
 }
 
 void TableViewCell::setAccessoryType(AccessoryType type) {
-  if (type == _accessoryType) return;
-  _accessoryType = type;
+  if (type == accessoryType_) return;
+  accessoryType_ = type;
   layoutSubviews();
   update();
 }
 
 void TableViewCell::setSelected(bool selected, bool /*animated*/) {
-  if (selected == _selected) return;
-  _selected = selected;
+  if (selected == selected_) return;
+  selected_ = selected;
   update();
 }
 
 void TableViewCell::layoutSubviews() {
-  const int trailing = _accessoryType == AccessoryType::None ? kTrailingMargin : kAccessoryWidth;
-  _contentView->setGeometry(0, 0, std::max(0, width() - trailing), height());
-  if (_textLabel) {
-    _textLabel->setGeometry(10, 0, std::max(0, _contentView->width() - 10), _contentView->height());
+  const int trailing = accessoryType_ == AccessoryType::None ? kTrailingMargin : kAccessoryWidth;
+  contentView_->setGeometry(0, 0, std::max(0, width() - trailing), height());
+  if (textLabel_) {
+    textLabel_->setGeometry(10, 0, std::max(0, contentView_->width() - 10), contentView_->height());
   }
 }
 
@@ -72,17 +72,17 @@ void TableViewCell::resizeEvent(QResizeEvent* event) {
 
 void TableViewCell::paintEvent(QPaintEvent*) {
   QPainter painter(this);
-  painter.fillRect(rect(), _selected || _pressed ? theme::kRowSelected : theme::kRowBackground);
+  painter.fillRect(rect(), selected_ || pressed_ ? theme::kRowSelected : theme::kRowBackground);
   painter.fillRect(QRect(kSeparatorInset, height() - 1, width() - kSeparatorInset, 1), theme::kSeparator);
 
-  if (_accessoryType == AccessoryType::None) return;
+  if (accessoryType_ == AccessoryType::None) return;
   painter.setRenderHint(QPainter::Antialiasing);
   const QPointF centre(width() - kAccessoryWidth / 2.0, height() / 2.0);
   QPainterPath path;
   QPen pen;
   pen.setCapStyle(Qt::RoundCap);
   pen.setJoinStyle(Qt::RoundJoin);
-  if (_accessoryType == AccessoryType::DisclosureIndicator) {
+  if (accessoryType_ == AccessoryType::DisclosureIndicator) {
     path.moveTo(centre + QPointF(-2.5, -6));
     path.lineTo(centre + QPointF(3.5, 0));
     path.lineTo(centre + QPointF(-2.5, 6));
@@ -101,17 +101,17 @@ void TableViewCell::paintEvent(QPaintEvent*) {
 
 void TableViewCell::mousePressEvent(QMouseEvent* event) {
   if (event->button() != Qt::LeftButton) return QWidget::mousePressEvent(event);
-  _pressed = true;
+  pressed_ = true;
   update();
 }
 
 void TableViewCell::mouseReleaseEvent(QMouseEvent* event) {
-  if (event->button() != Qt::LeftButton || !_pressed) return QWidget::mouseReleaseEvent(event);
-  _pressed = false;
+  if (event->button() != Qt::LeftButton || !pressed_) return QWidget::mouseReleaseEvent(event);
+  pressed_ = false;
   update();
-  if (!rect().contains(event->position().toPoint()) || !_tapHandler) return;
+  if (!rect().contains(event->position().toPoint()) || !tapHandler_) return;
   // A copy: the handler may reload the table, which replaces this row's handler.
-  const std::function<void()> handler = _tapHandler;
+  const std::function<void()> handler = tapHandler_;
   handler();
 }
 
@@ -122,71 +122,71 @@ TableView::TableView(QWidget* parent) : QScrollArea(parent) {
   setFrameShape(QFrame::NoFrame);
   setWidgetResizable(true);
   setHorizontalScrollBarPolicy(Qt::ScrollBarAlwaysOff);
-  _rowsWidget = new QWidget;
-  _rowsWidget->setObjectName(QStringLiteral("TableRows"));
-  _rowsWidget->setAutoFillBackground(true);
-  QPalette palette = _rowsWidget->palette();
+  rowsWidget_ = new QWidget;
+  rowsWidget_->setObjectName(QStringLiteral("TableRows"));
+  rowsWidget_->setAutoFillBackground(true);
+  QPalette palette = rowsWidget_->palette();
   palette.setColor(QPalette::Window, theme::kRowBackground);
-  _rowsWidget->setPalette(palette);
-  _rowsLayout = new QVBoxLayout(_rowsWidget);
-  _rowsLayout->setContentsMargins(0, 0, 0, 0);
-  _rowsLayout->setSpacing(0);
-  _rowsLayout->addStretch(1);
-  setWidget(_rowsWidget);
+  rowsWidget_->setPalette(palette);
+  rowsLayout_ = new QVBoxLayout(rowsWidget_);
+  rowsLayout_->setContentsMargins(0, 0, 0, 0);
+  rowsLayout_->setSpacing(0);
+  rowsLayout_->addStretch(1);
+  setWidget(rowsWidget_);
 }
 
 void TableView::reloadData() {
-  for (TableViewCell* cell : _cells) {
-    _rowsLayout->removeWidget(cell);
+  for (TableViewCell* cell : cells_) {
+    rowsLayout_->removeWidget(cell);
     cell->setSelected(false, false);
     cell->setTapHandler({});
   }
-  _reusePool = std::move(_cells);
-  _cells.clear();
+  reusePool_ = std::move(cells_);
+  cells_.clear();
 
-  const int rows = _dataSource ? std::max(0, _dataSource->tableViewNumberOfRowsInSection(*this, 0)) : 0;
+  const int rows = dataSource_ ? std::max(0, dataSource_->tableViewNumberOfRowsInSection(*this, 0)) : 0;
   for (int row = 0; row < rows; ++row) {
-    TableViewCell* cell = _dataSource->tableViewCellForRowAtIndexPath(*this, IndexPath{0, row});
+    TableViewCell* cell = dataSource_->tableViewCellForRowAtIndexPath(*this, IndexPath{0, row});
     if (!cell) continue;
     // A source that hands back a row still in the pool gives it up.
-    _reusePool.erase(std::remove(_reusePool.begin(), _reusePool.end(), cell), _reusePool.end());
-    cell->setParent(_rowsWidget);
+    reusePool_.erase(std::remove(reusePool_.begin(), reusePool_.end(), cell), reusePool_.end());
+    cell->setParent(rowsWidget_);
     cell->setTapHandler([this, cell] { tapped(cell); });
-    _rowsLayout->insertWidget(static_cast<int>(_cells.size()), cell);
+    rowsLayout_->insertWidget(static_cast<int>(cells_.size()), cell);
     cell->show();
-    _cells.push_back(cell);
+    cells_.push_back(cell);
   }
 
-  for (TableViewCell* unused : _reusePool) {
+  for (TableViewCell* unused : reusePool_) {
     unused->hide();
     unused->deleteLater();
   }
-  _reusePool.clear();
+  reusePool_.clear();
 }
 
 TableViewCell* TableView::dequeueReusableCellWithIdentifier(const QString& identifier) {
-  const auto found = std::find_if(_reusePool.begin(), _reusePool.end(),
+  const auto found = std::find_if(reusePool_.begin(), reusePool_.end(),
                                   [&](const TableViewCell* cell) { return cell->reuseIdentifier() == identifier; });
-  if (found == _reusePool.end()) return nullptr;
+  if (found == reusePool_.end()) return nullptr;
   TableViewCell* cell = *found;
-  _reusePool.erase(found);
+  reusePool_.erase(found);
   return cell;
 }
 
 TableViewCell* TableView::cellForRowAtIndexPath(const IndexPath& indexPath) const {
   if (indexPath.section != 0 || indexPath.row < 0 || indexPath.row >= numberOfRows()) return nullptr;
-  return _cells[static_cast<std::size_t>(indexPath.row)];
+  return cells_[static_cast<std::size_t>(indexPath.row)];
 }
 
 std::optional<IndexPath> TableView::indexPathForSelectedRow() const {
-  for (std::size_t i = 0; i < _cells.size(); ++i) {
-    if (_cells[i]->isSelected()) return IndexPath{0, static_cast<int>(i)};
+  for (std::size_t i = 0; i < cells_.size(); ++i) {
+    if (cells_[i]->isSelected()) return IndexPath{0, static_cast<int>(i)};
   }
   return std::nullopt;
 }
 
 void TableView::selectRowAtIndexPath(const IndexPath& indexPath, bool animated) {
-  for (TableViewCell* cell : _cells) cell->setSelected(false, animated);
+  for (TableViewCell* cell : cells_) cell->setSelected(false, animated);
   if (TableViewCell* cell = cellForRowAtIndexPath(indexPath)) cell->setSelected(true, animated);
 }
 
@@ -200,13 +200,13 @@ void TableView::sizeToFit() {
 }
 
 void TableView::tapped(TableViewCell* cell) {
-  const auto found = std::find(_cells.begin(), _cells.end(), cell);
+  const auto found = std::find(cells_.begin(), cells_.end(), cell);
   std::optional<IndexPath> indexPath;
-  if (found != _cells.end()) {
-    indexPath = IndexPath{0, static_cast<int>(found - _cells.begin())};
+  if (found != cells_.end()) {
+    indexPath = IndexPath{0, static_cast<int>(found - cells_.begin())};
     selectRowAtIndexPath(*indexPath, false);
   }
-  if (_dataSource) _dataSource->tableViewDidSelectRowAtIndexPath(*this, indexPath);
+  if (dataSource_) dataSource_->tableViewDidSelectRowAtIndexPath(*this, indexPath);
 }
 
 }  // namespace corvane

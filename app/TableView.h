@@ -36,21 +36,21 @@ class TableViewCell : public QWidget {
 
   TableViewCell(Style style, QString reuseIdentifier, QWidget* parent = nullptr);
 
-  Style style() const { return _style; }
-  const QString& reuseIdentifier() const { return _reuseIdentifier; }
+  Style style() const { return style_; }
+  const QString& reuseIdentifier() const { return reuseIdentifier_; }
   // The area the row's own labels go in: the row less its accessory.
-  QWidget* contentView() const { return _contentView; }
+  QWidget* contentView() const { return contentView_; }
   // The row's text label (made on first use), laid out across the content area.
   QLabel* textLabel();
 
   void setAccessoryType(AccessoryType type);
-  AccessoryType accessoryType() const { return _accessoryType; }
+  AccessoryType accessoryType() const { return accessoryType_; }
 
-  bool isSelected() const { return _selected; }
+  bool isSelected() const { return selected_; }
   void setSelected(bool selected, bool animated);
 
   // Called with every tap on the row (the table sets it).
-  void setTapHandler(std::function<void()> handler) { _tapHandler = std::move(handler); }
+  void setTapHandler(std::function<void()> handler) { tapHandler_ = std::move(handler); }
 
   QSize sizeHint() const override { return {320, kHeight}; }
 
@@ -65,15 +65,15 @@ class TableViewCell : public QWidget {
   void mouseReleaseEvent(QMouseEvent* event) override;
 
  private:
-  Style _style;
-  QString _reuseIdentifier;
-  QWidget* _contentView;
-  QLabel* _textLabel = nullptr;
-  QLabel* _accessory;
-  AccessoryType _accessoryType = AccessoryType::None;
-  bool _selected = false;
-  bool _pressed = false;
-  std::function<void()> _tapHandler;
+  Style style_;
+  QString reuseIdentifier_;
+  QWidget* contentView_;
+  QLabel* textLabel_ = nullptr;
+  QLabel* accessory_;
+  AccessoryType accessoryType_ = AccessoryType::None;
+  bool selected_ = false;
+  bool pressed_ = false;
+  std::function<void()> tapHandler_;
 };
 
 class TableViewDataSource {
@@ -94,7 +94,7 @@ class TableView final : public QScrollArea {
  public:
   explicit TableView(QWidget* parent = nullptr);
 
-  void setDataSource(TableViewDataSource* dataSource) { _dataSource = dataSource; }
+  void setDataSource(TableViewDataSource* dataSource) { dataSource_ = dataSource; }
 
   // Asks the data source for every row again. The rows shown so far go into the
   // reuse pool first, in order; rows left there afterwards are deleted.
@@ -103,7 +103,7 @@ class TableView final : public QScrollArea {
   // there), or nullptr. The table takes the row back when it is returned.
   TableViewCell* dequeueReusableCellWithIdentifier(const QString& identifier);
 
-  int numberOfRows() const { return static_cast<int>(_cells.size()); }
+  int numberOfRows() const { return static_cast<int>(cells_.size()); }
   TableViewCell* cellForRowAtIndexPath(const IndexPath& indexPath) const;
   std::optional<IndexPath> indexPathForSelectedRow() const;
   void selectRowAtIndexPath(const IndexPath& indexPath, bool animated);
@@ -115,11 +115,11 @@ class TableView final : public QScrollArea {
  private:
   void tapped(TableViewCell* cell);
 
-  TableViewDataSource* _dataSource = nullptr;
-  QWidget* _rowsWidget;
-  QVBoxLayout* _rowsLayout;
-  std::vector<TableViewCell*> _cells;
-  std::vector<TableViewCell*> _reusePool;
+  TableViewDataSource* dataSource_ = nullptr;
+  QWidget* rowsWidget_;
+  QVBoxLayout* rowsLayout_;
+  std::vector<TableViewCell*> cells_;
+  std::vector<TableViewCell*> reusePool_;
 };
 
 }  // namespace corvane

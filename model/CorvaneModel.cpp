@@ -18,31 +18,31 @@ std::optional<Bytes> serializeCommand(const Dictionary& command) {
 }  // namespace
 
 CorvaneModel::CorvaneModel(CorvaneModelEnvironment environment, CorvaneModelDelegate* delegate)
-    : _environment(std::move(environment)), _delegate(delegate), _self(std::make_shared<CorvaneModel*>(this)) {}
+    : environment_(std::move(environment)), delegate_(delegate), self_(std::make_shared<CorvaneModel*>(this)) {}
 
 CorvaneModel::~CorvaneModel() {
-  _self.reset();
+  self_.reset();
   destroyPorts();
 }
 
 // --- The log channel ---------------------------------------------------------
 
 bool CorvaneModel::createPorts() {
-  std::optional<std::string> uuid = _environment.makeUUID ? _environment.makeUUID() : std::nullopt;
+  std::optional<std::string> uuid = environment_.makeUUID ? environment_.makeUUID() : std::nullopt;
   if (!uuid) return false;
   const std::string name = "CorvaneApp." + *uuid;
 
   // Kept without a check: a missing local port shows up as a failed channel below.
-  _recvPort = _environment.ports.createLocalPort(
+  _recvPort = environment_.ports.createLocalPort(
       name, [this](LocalMessagePort& port, MessageId id, const Bytes& data) {
         return ReceiveLogPacket(port, id, data, this);
       });
   if (_recvPort) {
-    _recvPort->scheduleOn(_environment.runLoop);
+    _recvPort->scheduleOn(environment_.runLoop);
     _recvPort->setInvalidationCallback([this](MessagePort& port) { LogPortInvalidated(port, this); });
   }
 
-  std::unique_ptr<TelephonyConnection> connection = _environment.telephony.TelephonyServerConnectionCreate(
+  std::unique_ptr<TelephonyConnection> connection = environment_.telephony.TelephonyServerConnectionCreate(
       [this](TelephonyConnection& c, const std::string& notification, const Value& data) {
         TelephonyConnectionNotified(c, notification, data, this);
       });
@@ -64,7 +64,7 @@ bool CorvaneModel::createPorts() {
     return false;
   }
 
-  _sendPort = _environment.ports.createRemotePort(remoteName);
+  _sendPort = environment_.ports.createRemotePort(remoteName);
   if (!_sendPort) {
     log::write(log::kError, "Could not create the remote port!");
     return false;
@@ -76,7 +76,7 @@ bool CorvaneModel::createPorts() {
 
 void CorvaneModel::destroyPorts() {
   if (_displayUpdateTimer != 0) {
-    _environment.runLoop.cancel(_displayUpdateTimer);
+    environment_.runLoop.cancel(_displayUpdateTimer);
     _displayUpdateTimer = 0;
   }
   // The invalidation callback goes first, so that a deliberate teardown never restarts the monitor.
@@ -129,8 +129,8 @@ void CorvaneModel::configureGenerator() {
   const std::string* name = technology->asString();
   if (!name) {
     _logGenerator = nullptr;
-  } else if (_environment.generatorFromTechnology) {
-    _logGenerator = _environment.generatorFromTechnology(*name);
+  } else if (environment_.generatorFromTechnology) {
+    _logGenerator = environment_.generatorFromTechnology(*name);
   } else {
     _logGenerator = LogGenerator::generatorFromTechnology(*name);
   }
@@ -194,23 +194,25 @@ void CorvaneModel::startMonitor() {
   }
 
   log::write(log::kError, "Starting the display update timer");
-  _displayUpdateTimer = _environment.runLoop.scheduleRepeatingTimer(kDisplayUpdateInterval, [weak = std::weak_ptr(_self)] {
-    if (auto self = weak.lock()) (*self)->refresh();
-  });
+  _displayUpdateTimer =
+      environment_.runLoop.scheduleRepeatingTimer(kDisplayUpdateInterval, [weak = std::weak_ptr(self_)] {
+        if (auto self = weak.lock()) (*self)->refresh();
+      });
 }
 
 void CorvaneModel::scheduleRetry() {
   dispatchLater([](CorvaneModel& model) { model.startMonitor(); }, kRetryDelay);
 }
 
-void CorvaneModel::dispatchLater(std::function<void(CorvaneModel&)> task, std::optional<std::chrono::nanoseconds> delay) {
-  auto run = [weak = std::weak_ptr(_self), task = std::move(task)] {
+void CorvaneModel::dispatchLater(std::function<void(CorvaneModel&)> task,
+                                 std::optional<std::chrono::nanoseconds> delay) {
+  auto run = [weak = std::weak_ptr(self_), task = std::move(task)] {
     if (auto self = weak.lock()) task(**self);
   };
   if (delay) {
-    _environment.runLoop.dispatchAfter(*delay, std::move(run));
+    environment_.runLoop.dispatchAfter(*delay, std::move(run));
   } else {
-    _environment.runLoop.dispatchAsync(std::move(run));
+    environment_.runLoop.dispatchAsync(std::move(run));
   }
 }
 
@@ -229,7 +231,7 @@ void CorvaneModel::refresh() {
   _nodesByPath.reset();
   dispatchLater(
       [](CorvaneModel& model) {
-        if (model._delegate) model._delegate->updateViewControllerFromModel();
+        if (model.delegate_) model.delegate_->updateViewControllerFromModel();
       },
       std::nullopt);
 }

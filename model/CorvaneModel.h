@@ -90,8 +90,8 @@ class CorvaneModel {
   // Runs `task` on the main queue later, unless this model has gone by then.
   void dispatchLater(std::function<void(CorvaneModel&)> task, std::optional<std::chrono::nanoseconds> delay);
 
-  CorvaneModelEnvironment _environment;
-  CorvaneModelDelegate* _delegate;
+  CorvaneModelEnvironment environment_;
+  CorvaneModelDelegate* delegate_;
 
   std::shared_ptr<LocalMessagePort> _recvPort;
   std::shared_ptr<RemoteMessagePort> _sendPort;
@@ -103,7 +103,7 @@ class CorvaneModel {
   std::unique_ptr<PathDictionary> _nodesByPath;
 
   // Work dispatched for later holds a weak reference to this, so it does nothing once the model is gone.
-  std::shared_ptr<CorvaneModel*> _self;
+  std::shared_ptr<CorvaneModel*> self_;
 };
 
 }  // namespace corvane

@@ -29,13 +29,13 @@ namespace corvane::test {
 
 class FakeScreenHost final : public ScreenHost {
  public:
-  bool allowSaveButton() const override { return allow; }
-  void showSaveView() override { ++shows; }
-  void closeSaveView() override { ++closes; }
+  bool allowSaveButton() const override { return allow_; }
+  void showSaveView() override { ++shows_; }
+  void closeSaveView() override { ++closes_; }
 
-  bool allow = false;
-  int shows = 0;
-  int closes = 0;
+  bool allow_ = false;
+  int shows_ = 0;
+  int closes_ = 0;
 };
 
 // The node tree of a display object, as the model builds it.
@@ -51,7 +51,7 @@ inline CorvaneCell* cellAt(CorvanePaneController* screen, int row) {
 // The row whose key reads `key`, or -1.
 inline int rowWithKey(CorvanePaneController* screen, const QString& key) {
   for (int row = 0; row < screen->tableView()->numberOfRows(); ++row) {
-    if (cellAt(screen, row)->key()->text() == key) return row;
+    if (cellAt(screen, row)->key->text() == key) return row;
   }
   return -1;
 }

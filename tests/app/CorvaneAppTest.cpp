@@ -41,7 +41,7 @@ class CorvaneAppTest : public QObject {
     test::AppHarness harness;
     harness.app().applicationDidFinishLaunching();
     // The monitor waits for the launch to return.
-    QVERIFY(harness.service().channelRequests.empty());
+    QVERIFY(harness.service().channelRequests_.empty());
 
     QVERIFY(harness.app().window()->isVisible());
     QCOMPARE(harness.depth(), std::size_t{1});
@@ -54,7 +54,7 @@ class CorvaneAppTest : public QObject {
     QCOMPARE(harness.app().updateMessage(), QStringLiteral("Connecting..."));
 
     harness.loop().runPending();
-    QCOMPARE(harness.service().channelRequests.size(), std::size_t{1});
+    QCOMPARE(harness.service().channelRequests_.size(), std::size_t{1});
     QVERIFY(harness.app().model()->isConnected());
     // Still no data: nothing changes until the first update.
     QCOMPARE(test::statusTextOf(harness.top()), QStringLiteral("Connecting"));
@@ -69,7 +69,7 @@ class CorvaneAppTest : public QObject {
     CorvanePaneController* root = harness.top();
     QCOMPARE(root->title(), QStringLiteral("Corvane"));
     QCOMPARE(root->tableView()->numberOfRows(), 2);
-    QCOMPARE(test::cellAt(root, 0)->key()->text(), QStringLiteral("Network"));
+    QCOMPARE(test::cellAt(root, 0)->key->text(), QStringLiteral("Network"));
     QCOMPARE(harness.app().updateMessage(), QStringLiteral("Updated 2026-11-16 at 11:00:00"));
     QCOMPARE(test::statusTextOf(root), QStringLiteral("Updated 2026-11-16 at 11:00:00"));
     QVERIFY(!test::indicatorOf(root)->isAnimating());
@@ -97,12 +97,12 @@ class CorvaneAppTest : public QObject {
     harness.tick();
     test::tapRow(harness.top(), test::rowWithKey(harness.top(), QStringLiteral("Serving Cell")));
     CorvanePaneController* serving = harness.top();
-    QCOMPARE(test::cellAt(serving, 0)->value()->text(), QStringLiteral("62"));
+    QCOMPARE(test::cellAt(serving, 0)->value->text(), QStringLiteral("62"));
 
     harness.send(servingCell("70", true));
     harness.tick();
     QCOMPARE(harness.top(), serving);
-    QCOMPARE(test::cellAt(serving, 0)->value()->text(), QStringLiteral("70"));
+    QCOMPARE(test::cellAt(serving, 0)->value->text(), QStringLiteral("70"));
   }
 
   void aScreenWhoseRowVanishedIsPoppedBackToTheScreenBelow() {
@@ -135,7 +135,7 @@ class CorvaneAppTest : public QObject {
 
     // A packet, then the service goes away before the next tick.
     harness.send(servingCell("63", true));
-    harness.service().alive = false;
+    harness.service().alive_ = false;
     setDateSourceForTesting([] { return Date{(kSomeMorning + 60) * 1'000'000}; });
     harness.tick();
 
@@ -145,7 +145,7 @@ class CorvaneAppTest : public QObject {
     QCOMPARE(harness.app().updateMessage(), QStringLiteral("Updated 2026-11-16 at 11:00:00"));
 
     // Back again: the next update shows the new time.
-    harness.service().alive = true;
+    harness.service().alive_ = true;
     harness.loop().advanceBy(CorvaneModel::kRetryDelay);
     QVERIFY(harness.app().model()->isConnected());
     harness.send(servingCell("64", true));

@@ -58,11 +58,11 @@ class CorvanePaneControllerTest : public QObject {
 
     QCOMPARE(root->title(), QStringLiteral("Corvane"));
     QCOMPARE(root->tableView()->numberOfRows(), 3);
-    QCOMPARE(test::cellAt(root, 0)->key()->text(), QStringLiteral("Serving Cell"));
+    QCOMPARE(test::cellAt(root, 0)->key->text(), QStringLiteral("Serving Cell"));
     QCOMPARE(test::cellAt(root, 0)->accessoryType(), TableViewCell::AccessoryType::DisclosureIndicator);
-    QCOMPARE(test::cellAt(root, 0)->value(), nullptr);  // a key-only row
-    QCOMPARE(test::cellAt(root, 2)->key()->text(), QStringLiteral("Timing Advance"));
-    QCOMPARE(test::cellAt(root, 2)->value()->text(), QStringLiteral("3"));
+    QCOMPARE(test::cellAt(root, 0)->value, nullptr);  // a key-only row
+    QCOMPARE(test::cellAt(root, 2)->key->text(), QStringLiteral("Timing Advance"));
+    QCOMPARE(test::cellAt(root, 2)->value->text(), QStringLiteral("3"));
     QCOMPARE(test::cellAt(root, 2)->accessoryType(), TableViewCell::AccessoryType::None);
     QCOMPARE(test::cellAt(root, 2)->reuseIdentifier(), QStringLiteral("CorvanePaneControllerCell"));
   }
@@ -139,7 +139,7 @@ class CorvanePaneControllerTest : public QObject {
     QCOMPARE(root->toolbarItems().size(), std::size_t{3});
     QCOMPARE(root->toolbarItems()[2].kind, BarItem::Kind::FlexibleSpace);
 
-    host.allow = true;
+    host.allow_ = true;
     root->setStatus(QStringLiteral("Connecting"), true);
     QCOMPARE(root->toolbarItems().size(), std::size_t{4});
     auto* save = qobject_cast<QToolButton*>(root->toolbarItems()[3].widget.data());
@@ -147,7 +147,7 @@ class CorvanePaneControllerTest : public QObject {
     QCOMPARE(save->text(), QStringLiteral("Save"));
     QVERIFY(!save->icon().isNull());
     save->click();
-    QCOMPARE(host.shows, 1);
+    QCOMPARE(host.shows_, 1);
   }
 
   void theStatusTextUsesTheSystemFontAt14AndFollowsEveryChange() {
@@ -171,22 +171,22 @@ class CorvanePaneControllerTest : public QObject {
     auto* cell = CorvaneCell::initWithStyleKey(TableViewCell::Style::Value1, QStringLiteral("id"));
     std::unique_ptr<CorvaneCell> owner(cell);
     cell->resize(300, TableViewCell::kHeight);
-    cell->key()->setText(QStringLiteral("Neighbour Cells"));
+    cell->key->setText(QStringLiteral("Neighbour Cells"));
     cell->setLayoutKey();
     const QFontMetrics bold(theme::boldSystemFont(15));
-    QCOMPARE(cell->key()->font(), theme::boldSystemFont(15));
-    QCOMPARE(cell->key()->geometry(),
+    QCOMPARE(cell->key->font(), theme::boldSystemFont(15));
+    QCOMPARE(cell->key->geometry(),
              QRect(10, (cell->contentView()->height() - bold.height()) / 2,
                    bold.horizontalAdvance(QStringLiteral("Neighbour Cells")), bold.height()));
-    QCOMPARE(cell->key()->parentWidget(), cell->contentView());
-    QCOMPARE(cell->view(), nullptr);
+    QCOMPARE(cell->key->parentWidget(), cell->contentView());
+    QCOMPARE(cell->view, nullptr);
   }
 
   void aValueThatFitsIsRightAligned() {
     auto* cell = CorvaneCell::initWithStyle(TableViewCell::Style::Value1, QStringLiteral("id"));
     std::unique_ptr<CorvaneCell> owner(cell);
-    cell->key()->setText(QStringLiteral("RxLev"));
-    cell->value()->setText(QStringLiteral("-71 dBm"));
+    cell->key->setText(QStringLiteral("RxLev"));
+    cell->value->setText(QStringLiteral("-71 dBm"));
     const QFontMetrics bold(CorvaneCell::measuringFont());
     const int kw = bold.horizontalAdvance(QStringLiteral("RxLev"));
     const int vw = bold.horizontalAdvance(QStringLiteral("-71 dBm"));
@@ -194,18 +194,18 @@ class CorvanePaneControllerTest : public QObject {
     cell->setLayout();
     const int width = cell->contentView()->width();
     QCOMPARE(width, kw + 10 + 50 + vw + 1);
-    QCOMPARE(cell->value()->geometry(), QRect(width - vw, (cell->contentView()->height() - bold.height()) / 2, vw,
+    QCOMPARE(cell->value->geometry(), QRect(width - vw, (cell->contentView()->height() - bold.height()) / 2, vw,
                                               bold.height()));
-    QCOMPARE(cell->view()->widget()->size(), QSize(width, 50));
-    QCOMPARE(cell->view()->geometry(), QRect(0, 0, width, 50));
-    QCOMPARE(cell->value()->font(), theme::systemFont(15));
+    QCOMPARE(cell->view->widget()->size(), QSize(width, 50));
+    QCOMPARE(cell->view->geometry(), QRect(0, 0, width, 50));
+    QCOMPARE(cell->value->font(), theme::systemFont(15));
   }
 
   void aValueThatNeedsExactlyTheWidthStartsAfterTheKeyAndTheContentIsThatWide() {
     auto* cell = CorvaneCell::initWithStyle(TableViewCell::Style::Value1, QStringLiteral("id"));
     std::unique_ptr<CorvaneCell> owner(cell);
-    cell->key()->setText(QStringLiteral("Cell ID"));
-    cell->value()->setText(QStringLiteral("14465"));
+    cell->key->setText(QStringLiteral("Cell ID"));
+    cell->value->setText(QStringLiteral("14465"));
     // Measured in the bold font, although the value is drawn in the regular one.
     const QFontMetrics bold(theme::boldSystemFont(15));
     const int kw = bold.horizontalAdvance(QStringLiteral("Cell ID"));
@@ -216,18 +216,18 @@ class CorvanePaneControllerTest : public QObject {
     cell->setLayout();
 
     QCOMPARE(cell->contentView()->width(), need);
-    QCOMPARE(cell->key()->geometry().topLeft().x(), 10);
-    QCOMPARE(cell->value()->x(), 10 + kw + 50);
-    QCOMPARE(cell->value()->width(), vw);
-    QCOMPARE(cell->view()->widget()->width(), need);
+    QCOMPARE(cell->key->geometry().topLeft().x(), 10);
+    QCOMPARE(cell->value->x(), 10 + kw + 50);
+    QCOMPARE(cell->value->width(), vw);
+    QCOMPARE(cell->view->widget()->width(), need);
   }
 
   void aLongValueScrollsSidewaysAfterAFiftyPointGap() {
     auto* cell = CorvaneCell::initWithStyle(TableViewCell::Style::Value1, QStringLiteral("id"));
     std::unique_ptr<CorvaneCell> owner(cell);
     const QString value = QStringLiteral("310-410 / LAC 0x1A2B / Cell 40961 / ARFCN 62 / BSIC 5-3");
-    cell->key()->setText(QStringLiteral("Serving"));
-    cell->value()->setText(value);
+    cell->key->setText(QStringLiteral("Serving"));
+    cell->value->setText(value);
     const QFontMetrics bold(CorvaneCell::measuringFont());
     const int kw = bold.horizontalAdvance(QStringLiteral("Serving"));
     const int vw = bold.horizontalAdvance(value);
@@ -235,14 +235,14 @@ class CorvanePaneControllerTest : public QObject {
     cell->setLayout();
     QCOMPARE(cell->contentView()->width(), 240);
 
-    QCOMPARE(cell->value()->x(), 10 + kw + 50);
-    QCOMPARE(cell->view()->widget()->size(), QSize(240 + kw + vw, 50));
-    QCOMPARE(cell->view()->geometry(), QRect(0, 0, 240, 50));
+    QCOMPARE(cell->value->x(), 10 + kw + 50);
+    QCOMPARE(cell->view->widget()->size(), QSize(240 + kw + vw, 50));
+    QCOMPARE(cell->view->geometry(), QRect(0, 0, 240, 50));
     QCOMPARE(cell->toolTip(), value);
     // Shown, the row scrolls as far as the end of its content.
     cell->show();
     QVERIFY(QTest::qWaitForWindowExposed(cell));
-    QCOMPARE(cell->view()->horizontalScrollBar()->maximum(), kw + vw);
+    QCOMPARE(cell->view->horizontalScrollBar()->maximum(), kw + vw);
   }
 
   void rowsAreReusedAcrossReloadsUnderOneIdentifier() {
@@ -257,7 +257,7 @@ class CorvanePaneControllerTest : public QObject {
                                          {"Timing Advance", S("4")}})));
     QCOMPARE(test::cellAt(root, 0), first);
     QCOMPARE(test::cellAt(root, 2), last);
-    QCOMPARE(last->value()->text(), QStringLiteral("4"));
+    QCOMPARE(last->value->text(), QStringLiteral("4"));
   }
 
  private:

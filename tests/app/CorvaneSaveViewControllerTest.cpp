@@ -66,27 +66,29 @@ class CorvaneSaveViewControllerTest : public QObject {
   // A save screen over `contents`, opened at kOpened, writing into a fresh directory.
   struct Fixture {
     explicit Fixture(const Value& contents, bool directoryExists = true)
-        : directory(std::filesystem::path(temporary.path()) / "var/log/corvane/snapshots") {
-      if (directoryExists) std::filesystem::create_directories(directory);
+        : directory_(std::filesystem::path(temporary_.path()) / "var/log/corvane/snapshots") {
+      if (directoryExists) std::filesystem::create_directories(directory_);
       setDateSourceForTesting([] { return at(kOpened); });
-      screen = std::make_unique<CorvaneSaveViewController>(contents, host, loop, directory);
+      screen_ = std::make_unique<CorvaneSaveViewController>(contents, host_, loop_, directory_);
       setDateSourceForTesting([] { return at(kSaved); });
     }
     ~Fixture() { setDateSourceForTesting({}); }
-    std::string savedFile() const { return directory.string() + "/CorvaneSnapshot-" + std::to_string(kSaved) + ".corvane"; }
+    std::string savedFile() const {
+      return directory_.string() + "/CorvaneSnapshot-" + std::to_string(kSaved) + ".corvane";
+    }
 
-    test::TemporaryDirectory temporary;
-    std::filesystem::path directory;
-    test::FakeScreenHost host;
-    VirtualRunLoop loop;
-    std::unique_ptr<CorvaneSaveViewController> screen;
+    test::TemporaryDirectory temporary_;
+    std::filesystem::path directory_;
+    test::FakeScreenHost host_;
+    VirtualRunLoop loop_;
+    std::unique_ptr<CorvaneSaveViewController> screen_;
   };
 
  private slots:
   void everyEntryIsListedByItsDescriptionWithACheckMark() {
     Fixture fixture(twoSnapshots());
-    TableView* table = fixture.screen->saveContentTable();
-    QCOMPARE(fixture.screen->numberOfSectionsInTableView(*table), 1);
+    TableView* table = fixture.screen_->saveContentTable();
+    QCOMPARE(fixture.screen_->numberOfSectionsInTableView(*table), 1);
     QCOMPARE(table->numberOfRows(), 3);
     for (int row = 0; row < 3; ++row) {
       TableViewCell* cell = table->cellForRowAtIndexPath(IndexPath{0, row});
@@ -103,8 +105,8 @@ class CorvaneSaveViewControllerTest : public QObject {
 
   void theSnapshotHoldsTheTimestampOfOpeningTheContentsAndTheDescription() {
     Fixture fixture(twoSnapshots());
-    fixture.screen->saveDescription()->setText(QStringLiteral("Handover at the bridge, café"));
-    fixture.screen->saveButton()->click();
+    fixture.screen_->saveDescription()->setText(QStringLiteral("Handover at the bridge, café"));
+    fixture.screen_->saveButton()->click();
 
     const Value saved = readPlist(fixture.savedFile());
     QCOMPARE(keysOf(saved), (std::vector<std::string>{"Timestamp", "Data", "Description"}));
@@ -120,19 +122,19 @@ class CorvaneSaveViewControllerTest : public QObject {
 
   void theTimestampIsTheMomentOfOpeningAndTheFileNameTheMomentOfSaving() {
     Fixture fixture(twoSnapshots());
-    QCOMPARE(fixture.screen->timeStamp(), at(kOpened));
-    fixture.screen->saveButton()->click();
+    QCOMPARE(fixture.screen_->timeStamp(), at(kOpened));
+    fixture.screen_->saveButton()->click();
     QVERIFY(std::filesystem::exists(fixture.savedFile()));
-    QVERIFY(!std::filesystem::exists(fixture.directory / ("CorvaneSnapshot-" + std::to_string(kOpened) + ".corvane")));
+    QVERIFY(!std::filesystem::exists(fixture.directory_ / ("CorvaneSnapshot-" + std::to_string(kOpened) + ".corvane")));
     QCOMPARE(savedText(fixture.savedFile(), "Timestamp"), dateText(at(kOpened)));
-    QCOMPARE(fixture.screen->snapshotFileAt(Date{1794816000'999'999}),
-             fixture.directory.string() + "/CorvaneSnapshot-1794816000.corvane");
+    QCOMPARE(fixture.screen_->snapshotFileAt(Date{1794816000'999'999}),
+             fixture.directory_.string() + "/CorvaneSnapshot-1794816000.corvane");
   }
 
   void anEmptyHistoryListsNothingAndSavesAnEmptyDataArray() {
     Fixture fixture{Value(Array())};
-    QCOMPARE(fixture.screen->saveContentTable()->numberOfRows(), 0);
-    fixture.screen->saveButton()->click();
+    QCOMPARE(fixture.screen_->saveContentTable()->numberOfRows(), 0);
+    fixture.screen_->saveButton()->click();
     const Value saved = readPlist(fixture.savedFile());
     QCOMPARE(keysOf(saved), (std::vector<std::string>{"Timestamp", "Data", "Description"}));
     QVERIFY(*saved.asDictionary()->find("Data") == Value(Array()));
@@ -140,7 +142,7 @@ class CorvaneSaveViewControllerTest : public QObject {
 
   void anUntouchedDescriptionSavesTheFieldsEmptyText() {
     Fixture fixture(twoSnapshots());
-    fixture.screen->saveButton()->click();
+    fixture.screen_->saveButton()->click();
     const Value saved = readPlist(fixture.savedFile());
     const Value* description = saved.asDictionary()->find("Description");
     QVERIFY(description && description->asString());
@@ -149,8 +151,8 @@ class CorvaneSaveViewControllerTest : public QObject {
 
   void withoutSaveContentsTheFileHoldsOnlyTheTimestamp() {
     Fixture fixture{Value()};
-    fixture.screen->saveDescription()->setText(QStringLiteral("dropped with the missing data"));
-    fixture.screen->saveButton()->click();
+    fixture.screen_->saveDescription()->setText(QStringLiteral("dropped with the missing data"));
+    fixture.screen_->saveButton()->click();
     QCOMPARE(keysOf(readPlist(fixture.savedFile())), std::vector<std::string>{"Timestamp"});
   }
 
@@ -158,39 +160,40 @@ class CorvaneSaveViewControllerTest : public QObject {
     const Value contents = twoSnapshots();
     Fixture fixture(contents);
     contents.asArray()->clear();
-    fixture.screen->saveButton()->click();
+    fixture.screen_->saveButton()->click();
     QVERIFY(savedEntry(fixture.savedFile(), "Data") == twoSnapshots());
   }
 
   void aSecondSaveInTheSameSecondReplacesTheFirst() {
     Fixture fixture(twoSnapshots());
-    fixture.screen->saveDescription()->setText(QStringLiteral("first"));
-    fixture.screen->saveButton()->click();
-    fixture.screen->saveDescription()->setText(QStringLiteral("second"));
-    fixture.screen->saveButton()->click();
+    fixture.screen_->saveDescription()->setText(QStringLiteral("first"));
+    fixture.screen_->saveButton()->click();
+    fixture.screen_->saveDescription()->setText(QStringLiteral("second"));
+    fixture.screen_->saveButton()->click();
     QCOMPARE(savedText(fixture.savedFile(), "Description"), std::string("second"));
-    QCOMPARE(std::distance(std::filesystem::directory_iterator(fixture.directory), std::filesystem::directory_iterator()),
-             1);
+    QCOMPARE(
+        std::distance(std::filesystem::directory_iterator(fixture.directory_), std::filesystem::directory_iterator()),
+        1);
   }
 
   void savingAndCancellingCloseTheScreenThroughTheMainQueue() {
     Fixture fixture(twoSnapshots());
-    fixture.screen->saveButton()->click();
-    QCOMPARE(fixture.host.closes, 0);
-    fixture.loop.runPending();
-    QCOMPARE(fixture.host.closes, 1);
+    fixture.screen_->saveButton()->click();
+    QCOMPARE(fixture.host_.closes_, 0);
+    fixture.loop_.runPending();
+    QCOMPARE(fixture.host_.closes_, 1);
 
     Fixture cancelled(twoSnapshots());
-    cancelled.screen->cancelButton()->click();
-    cancelled.loop.runPending();
-    QCOMPARE(cancelled.host.closes, 1);
-    QVERIFY(std::filesystem::is_empty(cancelled.directory));
+    cancelled.screen_->cancelButton()->click();
+    cancelled.loop_.runPending();
+    QCOMPARE(cancelled.host_.closes_, 1);
+    QVERIFY(std::filesystem::is_empty(cancelled.directory_));
   }
 
   void aFailedWriteLogsShowsTheFileErrorAlertAndStillCloses() {
     log::ScopedCapture log;
     Fixture fixture(twoSnapshots(), false);
-    fixture.screen->saveButton()->click();
+    fixture.screen_->saveButton()->click();
 
     QCOMPARE(log.lines(), (std::vector<log::Line>{{3, "Unable to write snapshot to " + fixture.savedFile()}}));
     QMessageBox* alert = nullptr;
@@ -203,8 +206,8 @@ class CorvaneSaveViewControllerTest : public QObject {
     QCOMPARE(alert->buttons().size(), 1);
     QCOMPARE(alert->buttons()[0]->text(), QStringLiteral("Close"));
 
-    fixture.loop.runPending();
-    QCOMPARE(fixture.host.closes, 1);
+    fixture.loop_.runPending();
+    QCOMPARE(fixture.host_.closes_, 1);
     QVERIFY(!std::filesystem::exists(fixture.savedFile()));
 
     QPointer<QMessageBox> closing = alert;
@@ -214,8 +217,8 @@ class CorvaneSaveViewControllerTest : public QObject {
 
   void plistutilReadsTheSnapshotBack() {
     Fixture fixture(twoSnapshots());
-    fixture.screen->saveDescription()->setText(QStringLiteral("Drive test, route 7"));
-    fixture.screen->saveButton()->click();
+    fixture.screen_->saveDescription()->setText(QStringLiteral("Drive test, route 7"));
+    fixture.screen_->saveButton()->click();
 
     const QString plistutil = QStandardPaths::findExecutable(QStringLiteral("plistutil"));
     if (plistutil.isEmpty()) QFAIL("plistutil is missing (Debian package libplist-utils, see scripts/deps.sh)");
@@ -234,25 +237,25 @@ class CorvaneSaveViewControllerTest : public QObject {
 
   void returnAndTapsOnTheBackgroundOnlyPutTheKeyboardAway() {
     Fixture fixture(twoSnapshots());
-    fixture.screen->show();
-    QVERIFY(QTest::qWaitForWindowExposed(fixture.screen.get()));
-    fixture.screen->activateWindow();
-    QLineEdit* field = fixture.screen->saveDescription();
+    fixture.screen_->show();
+    QVERIFY(QTest::qWaitForWindowExposed(fixture.screen_.get()));
+    fixture.screen_->activateWindow();
+    QLineEdit* field = fixture.screen_->saveDescription();
     field->setFocus();
     QTRY_VERIFY(field->hasFocus());
     QTest::keyClicks(field, QStringLiteral("kept"));
     QTest::keyClick(field, Qt::Key_Return);
     QVERIFY(!field->hasFocus());
     QCOMPARE(field->text(), QStringLiteral("kept"));
-    QVERIFY(fixture.screen->textFieldShouldReturn(field));
+    QVERIFY(fixture.screen_->textFieldShouldReturn(field));
 
     field->setFocus();
     QTRY_VERIFY(field->hasFocus());
-    QTest::mouseClick(fixture.screen.get(), Qt::LeftButton, Qt::NoModifier, QPoint(5, fixture.screen->height() - 5));
+    QTest::mouseClick(fixture.screen_.get(), Qt::LeftButton, Qt::NoModifier, QPoint(5, fixture.screen_->height() - 5));
     QVERIFY(!field->hasFocus());
-    QCOMPARE(fixture.host.closes, 0);
-    QCOMPARE(fixture.loop.timerCount() + fixture.loop.delayedCount(), std::size_t{0});
-    QVERIFY(std::filesystem::is_empty(fixture.directory));
+    QCOMPARE(fixture.host_.closes_, 0);
+    QCOMPARE(fixture.loop_.timerCount() + fixture.loop_.delayedCount(), std::size_t{0});
+    QVERIFY(std::filesystem::is_empty(fixture.directory_));
   }
 };
 

@@ -29,13 +29,13 @@ constexpr int kWindowHeight = 720;
 class LiveService {
  public:
   explicit LiveService(const std::vector<std::string>& options) {
-    std::filesystem::create_directories(devicePath(kSaveEnablingMarkerPath, root));
-    std::filesystem::create_directories(devicePath(kSnapshotDirectoryPath, root));
-    ::setenv("CORVANE_RUNTIME_DIR", runtime.c_str(), 1);
-    platform = SocketModelEnvironment::create(error);
+    std::filesystem::create_directories(devicePath(kSaveEnablingMarkerPath, root_));
+    std::filesystem::create_directories(devicePath(kSnapshotDirectoryPath, root_));
+    ::setenv("CORVANE_RUNTIME_DIR", runtime_.c_str(), 1);
+    platform_ = SocketModelEnvironment::create(error_);
     std::vector<std::string> argv{kService};
     argv.insert(argv.end(), options.begin(), options.end());
-    pid_ = test::startProcess(argv, {"CORVANE_RUNTIME_DIR=" + runtime}, directory.path() + "/service.log");
+    pid_ = test::startProcess(argv, {"CORVANE_RUNTIME_DIR=" + runtime_}, directory_.path() + "/service.log");
   }
   ~LiveService() {
     if (pid_ > 0) test::stopProcess(pid_, SIGTERM);
@@ -44,14 +44,14 @@ class LiveService {
   LiveService(const LiveService&) = delete;
   LiveService& operator=(const LiveService&) = delete;
 
-  bool listening() const { return std::filesystem::exists(runtime + "/corvane-telephonyd.sock"); }
-  QString configDirectory() const { return QString::fromStdString(directory.path() + "/config"); }
+  bool listening() const { return std::filesystem::exists(runtime_ + "/corvane-telephonyd.sock"); }
+  QString configDirectory() const { return QString::fromStdString(directory_.path() + "/config"); }
 
-  test::TemporaryDirectory directory;
-  const std::string runtime = directory.path() + "/run";
-  const std::filesystem::path root = directory.path() + "/device";
-  std::string error;
-  std::unique_ptr<SocketModelEnvironment> platform;
+  test::TemporaryDirectory directory_;
+  const std::string runtime_ = directory_.path() + "/run";
+  const std::filesystem::path root_ = directory_.path() + "/device";
+  std::string error_;
+  std::unique_ptr<SocketModelEnvironment> platform_;
 
  private:
   int pid_ = -1;
@@ -93,13 +93,13 @@ class ScreenshotTest : public QObject {
  private slots:
   void theApplicationShowsTheServicesTreeOpensASectionAndSavesASnapshot() {
     LiveService service({"--technology", "IFX", "--seed", "7", "--rate", "50"});
-    QVERIFY2(service.platform, service.error.c_str());
+    QVERIFY2(service.platform_, service.error_.c_str());
     QTRY_VERIFY_WITH_TIMEOUT(service.listening(), 10000);
-    const std::filesystem::path& root = service.root;
+    const std::filesystem::path& root = service.root_;
 
     Preferences preferences(service.configDirectory());
     {
-      CorvaneApp app(CorvaneAppEnvironment{service.platform->environment(), preferences, root});
+      CorvaneApp app(CorvaneAppEnvironment{service.platform_->environment(), preferences, root});
       QVERIFY(launch(app));
       QWidget* window = app.window();
       NavigationController* navigation = app.navigationController();
@@ -110,7 +110,7 @@ class ScreenshotTest : public QObject {
       QVERIFY(app.model()->isConnected());
       QVERIFY(test::statusTextOf(top()).startsWith(QStringLiteral("Updated ")));
       QVERIFY(test::indicatorOf(top())->isHidden());
-      QCOMPARE(test::cellAt(top(), 0)->key()->text(), QStringLiteral("Network"));
+      QCOMPARE(test::cellAt(top(), 0)->key->text(), QStringLiteral("Network"));
       QVERIFY(keep(window, QStringLiteral("root")));
       // The window carries the application's icon (drawn from its SVG).
       const QPixmap icon = window->windowIcon().pixmap(128, 128);
@@ -122,7 +122,7 @@ class ScreenshotTest : public QObject {
       QVERIFY(test::rowWithKey(top(), QStringLiteral("ARFCN")) >= 0);
       const int rxlev = test::rowWithKey(top(), QStringLiteral("RxLev"));
       QVERIFY(rxlev >= 0);
-      QVERIFY(test::cellAt(top(), rxlev)->value()->text().endsWith(QStringLiteral(" dBm")));
+      QVERIFY(test::cellAt(top(), rxlev)->value->text().endsWith(QStringLiteral(" dBm")));
       // It stays current: the next update reloads it in place.
       const QString firstStatus = test::statusTextOf(top());
       QTRY_VERIFY_WITH_TIMEOUT(test::statusTextOf(top()) != firstStatus, 10000);
@@ -155,25 +155,25 @@ class ScreenshotTest : public QObject {
   // they change from one display update to a later one.
   void theLteScenarioShowsLiveChangingValuesOnEveryLteScreen() {
     LiveService service({"--technology", "Quendra_LTE", "--seed", "3", "--rate", "10"});
-    QVERIFY2(service.platform, service.error.c_str());
+    QVERIFY2(service.platform_, service.error_.c_str());
     QTRY_VERIFY_WITH_TIMEOUT(service.listening(), 10000);
 
     Preferences preferences(service.configDirectory());
     {
-      CorvaneApp app(CorvaneAppEnvironment{service.platform->environment(), preferences, service.root});
+      CorvaneApp app(CorvaneAppEnvironment{service.platform_->environment(), preferences, service.root_});
       QVERIFY(launch(app));
       QWidget* window = app.window();
       NavigationController* navigation = app.navigationController();
       auto top = [&] { return qobject_cast<CorvanePaneController*>(navigation->topViewController()); };
       QTRY_VERIFY_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 4, 20000);
-      QCOMPARE(test::cellAt(top(), 0)->key()->text(), QStringLiteral("Serving Cell"));
+      QCOMPARE(test::cellAt(top(), 0)->key->text(), QStringLiteral("Serving Cell"));
       QVERIFY(keep(window, QStringLiteral("lte-root")));
 
       // The text of every row of the top screen, key and value.
       auto rowsOf = [&] {
         QStringList rows;
         for (int i = 0; i < top()->tableView()->numberOfRows(); ++i) {
-          rows << test::cellAt(top(), i)->key()->text() + QLatin1Char('=') + test::cellAt(top(), i)->value()->text();
+          rows << test::cellAt(top(), i)->key->text() + QLatin1Char('=') + test::cellAt(top(), i)->value->text();
         }
         return rows;
       };
@@ -181,7 +181,7 @@ class ScreenshotTest : public QObject {
       auto decoded = [&] {
         if (top()->tableView()->numberOfRows() == 0) return false;
         for (int i = 0; i < top()->tableView()->numberOfRows(); ++i) {
-          const QString value = test::cellAt(top(), i)->value()->text();
+          const QString value = test::cellAt(top(), i)->value->text();
           if (value.isEmpty() || value == QLatin1String("-")) return false;
         }
         return true;

@@ -29,8 +29,8 @@ const std::string kService = CORVANE_TELEPHONYD_BINARY;
 
 class CountingDelegate final : public CorvaneModelDelegate {
  public:
-  void updateViewControllerFromModel() override { ++updates; }
-  int updates = 0;
+  void updateViewControllerFromModel() override { ++updates_; }
+  int updates_ = 0;
 };
 
 class ServiceAndModel : public ::testing::Test {
@@ -87,7 +87,7 @@ TEST_F(ServiceAndModel, TheTreeAppearsSurvivesTheServiceDyingAndComesBackWithIts
   model_.startMonitor();
   ASSERT_TRUE(model_.isRunning()) << testing::PrintToString(log_.texts());
 
-  ASSERT_TRUE(waitFor([&] { return delegate_.updates > 0; }));
+  ASSERT_TRUE(waitFor([&] { return delegate_.updates_ > 0; }));
   EXPECT_EQ(valueAt("/Network/MCC"), "001");
   EXPECT_EQ(valueAt("/Network/Technology"), "GSM");
   EXPECT_NE(valueAt("/Serving Cell/ARFCN"), "");
@@ -105,9 +105,9 @@ TEST_F(ServiceAndModel, TheTreeAppearsSurvivesTheServiceDyingAndComesBackWithIts
   EXPECT_FALSE(model_.isConnected());
 
   // It comes back: so does the tree, and the history from before is still there.
-  const int updatesBefore = delegate_.updates;
+  const int updatesBefore = delegate_.updates_;
   startService();
-  ASSERT_TRUE(waitFor([&] { return model_.isRunning() && delegate_.updates > updatesBefore; }));
+  ASSERT_TRUE(waitFor([&] { return model_.isRunning() && delegate_.updates_ > updatesBefore; }));
   EXPECT_EQ(valueAt("/Network/MCC"), "001");
   EXPECT_GT(historySize(), historyBefore);
 }

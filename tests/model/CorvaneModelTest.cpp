@@ -23,8 +23,8 @@ using test::S;
 
 class CountingDelegate final : public CorvaneModelDelegate {
  public:
-  void updateViewControllerFromModel() override { ++updates; }
-  int updates = 0;
+  void updateViewControllerFromModel() override { ++updates_; }
+  int updates_ = 0;
 };
 
 class Model : public ::testing::Test {
@@ -66,30 +66,30 @@ TEST_F(Model, StartingConnectsQueriesTheTechnologyAndSendsTheStartCommand) {
   ASSERT_TRUE(model_->isRunning());
   ASSERT_NE(model_->logGenerator(), nullptr);
 
-  ASSERT_EQ(service_.localPorts.size(), 1u);
-  const auto& local = *service_.localPorts[0];
+  ASSERT_EQ(service_.localPorts_.size(), 1u);
+  const auto& local = *service_.localPorts_[0];
   EXPECT_EQ(local.name(), "CorvaneApp.00000000-0000-0000-0000-100000000001");
   EXPECT_TRUE(local.scheduled());
   EXPECT_TRUE(local.hasInvalidationCallback());
-  EXPECT_EQ(service_.channelRequests, std::vector<std::string>{local.name()});
+  EXPECT_EQ(service_.channelRequests_, std::vector<std::string>{local.name()});
 
-  ASSERT_EQ(service_.commands.size(), 2u);
-  const auto& query = service_.commands[0];
+  ASSERT_EQ(service_.commands_.size(), 2u);
+  const auto& query = service_.commands_[0];
   EXPECT_EQ(query.port, "CorvaneTS.1");
   EXPECT_EQ(query.id, 0);
   EXPECT_EQ(query.command, D({{"GetTechnology", S("GetTechnology")}}));
   EXPECT_EQ(query.sendTimeout, 1.0);
   EXPECT_EQ(query.receiveTimeout, 1.0);
   EXPECT_TRUE(query.wantsReply);
-  const auto& start = service_.commands[1];
+  const auto& start = service_.commands_[1];
   EXPECT_EQ(start.id, 0);
   EXPECT_EQ(start.command, D({{"SetState", S("Streaming")}}));
   EXPECT_EQ(start.sendTimeout, 1.0);
   EXPECT_EQ(start.receiveTimeout, 0.0);
   EXPECT_FALSE(start.wantsReply);
 
-  const std::string created = " ***** Created ports (send=" + log::pointerText(service_.remotePorts[0].get()) +
-                              ", recv=" + log::pointerText(service_.localPorts[0].get()) + ")";
+  const std::string created = " ***** Created ports (send=" + log::pointerText(service_.remotePorts_[0].get()) +
+                              ", recv=" + log::pointerText(service_.localPorts_[0].get()) + ")";
   const std::string got = "Got log generated: " + log::pointerText(model_->logGenerator());
   const std::string creating = "Creating Log object: " + log::pointerText(model_->logGenerator());
   EXPECT_EQ(lines(), (std::vector<std::string>{created, creating, got, "Starting the display update timer"}));
@@ -106,19 +106,19 @@ TEST_F(Model, StartingConnectsQueriesTheTechnologyAndSendsTheStartCommand) {
 TEST_F(Model, ASecondStartWhileRunningDoesNothing) {
   startRunning();
   model_->startMonitor();
-  EXPECT_EQ(service_.connectionsOpened, 1);
-  EXPECT_EQ(service_.localPorts.size(), 1u);
+  EXPECT_EQ(service_.connectionsOpened_, 1);
+  EXPECT_EQ(service_.localPorts_.size(), 1u);
   EXPECT_EQ(loop_.timerCount(), 1u);
   EXPECT_TRUE(lines().empty());
 }
 
 TEST_F(Model, AnUnreachableServiceIsRetriedEveryFiveSecondsWithoutLimit) {
-  service_.reachable = false;
+  service_.reachable_ = false;
   model_->startMonitor();
   EXPECT_EQ(count("Could not create TSServerConnection"), 1u);
   EXPECT_EQ(count("Could not create the ports necessary"), 1u);
   EXPECT_FALSE(model_->isConnected());
-  EXPECT_EQ(service_.localPorts.back()->isValid(), false) << "the ports made so far are torn down";
+  EXPECT_EQ(service_.localPorts_.back()->isValid(), false) << "the ports made so far are torn down";
 
   loop_.advanceBy(4999ms);
   EXPECT_EQ(count("Could not create the ports necessary"), 1u);
@@ -128,18 +128,18 @@ TEST_F(Model, AnUnreachableServiceIsRetriedEveryFiveSecondsWithoutLimit) {
   EXPECT_EQ(count("Could not create the ports necessary"), 14u);
   EXPECT_EQ(loop_.delayedCount(), 1u) << "one retry waiting, no pile-up";
 
-  service_.reachable = true;
+  service_.reachable_ = true;
   loop_.advanceBy(5s);
   EXPECT_TRUE(model_->isRunning());
   EXPECT_EQ(count("Could not create the ports necessary"), 14u);
 }
 
 TEST_F(Model, EachAttemptUsesAFreshLocalPortName) {
-  service_.reachable = false;
+  service_.reachable_ = false;
   model_->startMonitor();
   loop_.advanceBy(5s);
-  ASSERT_EQ(service_.localPorts.size(), 2u);
-  EXPECT_NE(service_.localPorts[0]->name(), service_.localPorts[1]->name());
+  ASSERT_EQ(service_.localPorts_.size(), 2u);
+  EXPECT_NE(service_.localPorts_[0]->name(), service_.localPorts_[1]->name());
 }
 
 TEST_F(Model, AFailedUuidFailsTheAttemptQuietly) {
@@ -148,22 +148,22 @@ TEST_F(Model, AFailedUuidFailsTheAttemptQuietly) {
   EXPECT_TRUE(lines().empty());
   model_->startMonitor();
   EXPECT_EQ(lines(), std::vector<std::string>{"Could not create the ports necessary"});
-  EXPECT_EQ(service_.connectionsOpened, 0);
+  EXPECT_EQ(service_.connectionsOpened_, 0);
 }
 
 TEST_F(Model, ChannelFailuresAreLoggedAndRetried) {
-  service_.channelErrorCode = 5;
+  service_.channelErrorCode_ = 5;
   model_->startMonitor();
   EXPECT_EQ(count("_TSServerConnectionNetworkMonitorCreateLogChannel returns error: 5!"), 1u);
   EXPECT_EQ(count("Could not create the ports necessary"), 1u);
 
-  service_.channelErrorCode = 0;
-  service_.commandPortName = "";
+  service_.channelErrorCode_ = 0;
+  service_.commandPortName_ = "";
   loop_.advanceBy(5s);
   EXPECT_EQ(count("Could not create a log channel (TS returned null port)!"), 1u);
 
-  service_.commandPortName = "CorvaneTS.1";
-  service_.remotePortCreatable = false;
+  service_.commandPortName_ = "CorvaneTS.1";
+  service_.remotePortCreatable_ = false;
   loop_.advanceBy(5s);
   EXPECT_EQ(count("Could not create the remote port!"), 1u);
   EXPECT_EQ(count("Could not create the ports necessary"), 3u);
@@ -171,20 +171,20 @@ TEST_F(Model, ChannelFailuresAreLoggedAndRetried) {
 }
 
 TEST_F(Model, AReplyThatIsNotAPropertyListGivesNoGeneratorAndARetry) {
-  service_.technologyReply = test::bytesOf("IFX, honestly");
+  service_.technologyReply_ = test::bytesOf("IFX, honestly");
   model_->startMonitor();
   EXPECT_EQ(lines().back(), "No log generator technology works");
   EXPECT_EQ(count(" ***** Could not parse reply to GetTechnology; cannot configure"), 1u);
   EXPECT_EQ(model_->logGenerator(), nullptr);
   EXPECT_FALSE(model_->isConnected());
-  EXPECT_EQ(service_.connectionsOpened, 1);
+  EXPECT_EQ(service_.connectionsOpened_, 1);
   loop_.advanceBy(5s);
-  EXPECT_EQ(service_.connectionsOpened, 2);
+  EXPECT_EQ(service_.connectionsOpened_, 2);
   EXPECT_EQ(count(" ***** Could not parse reply to GetTechnology; cannot configure"), 2u);
 }
 
 TEST_F(Model, AnUnknownTechnologyLogsTheNullGeneratorThenNoGeneratorWorks) {
-  service_.technologyReply = FakeTelephony::replyFor("WiMAX");
+  service_.technologyReply_ = FakeTelephony::replyFor("WiMAX");
   model_->startMonitor();
   const auto all = lines();
   ASSERT_GE(all.size(), 2u);
@@ -194,28 +194,28 @@ TEST_F(Model, AnUnknownTechnologyLogsTheNullGeneratorThenNoGeneratorWorks) {
 }
 
 TEST_F(Model, TechnologyQueryFailuresHaveTheirOwnLines) {
-  service_.technologyStatus = kPortReceiveTimeout;
+  service_.technologyStatus_ = kPortReceiveTimeout;
   model_->startMonitor();
   EXPECT_EQ(count(" ***** Could not send the GetTechnology command (got error=-2)"), 1u);
 
-  service_.technologyStatus = kPortSuccess;
-  service_.technologyReply = std::nullopt;
+  service_.technologyStatus_ = kPortSuccess;
+  service_.technologyReply_ = std::nullopt;
   loop_.advanceBy(5s);
   EXPECT_EQ(count(" ***** No response to GetTechnology; cannot configure"), 1u);
 
-  service_.technologyReply = plist::serializeOrThrow(D({{"Technology", S("IFX")}}), plist::Format::XML);
+  service_.technologyReply_ = plist::serializeOrThrow(D({{"Technology", S("IFX")}}), plist::Format::XML);
   loop_.advanceBy(5s);
   EXPECT_EQ(count(" ***** Reply to GetTechnology had no answer; cannot configure"), 1u);
   EXPECT_EQ(count("No log generator technology works"), 3u);
 }
 
 TEST_F(Model, AFailedStartCommandTearsDownAndRetries) {
-  service_.startStatus = kPortSendTimeout;
+  service_.startStatus_ = kPortSendTimeout;
   model_->startMonitor();
   EXPECT_EQ(count(" ***** Could not send the START command (got error=-1)"), 1u);
   EXPECT_FALSE(model_->isRunning());
   EXPECT_FALSE(model_->isConnected());
-  service_.startStatus = kPortSuccess;
+  service_.startStatus_ = kPortSuccess;
   loop_.advanceBy(5s);
   EXPECT_TRUE(model_->isRunning());
 }
@@ -225,7 +225,7 @@ TEST_F(Model, APacketWithMessageIdOneIsIgnoredWithoutAReply) {
   EXPECT_EQ(service_.sendPacket(packet("62"), 1), std::nullopt);
   EXPECT_FALSE(model_->state().contains("Display"));
   loop_.advanceBy(2s);
-  EXPECT_EQ(delegate_.updates, 0);
+  EXPECT_EQ(delegate_.updates_, 0);
   EXPECT_EQ(service_.sendPacket(packet("62"), 0), std::nullopt);
   EXPECT_TRUE(model_->state().contains("Display"));
 }
@@ -242,16 +242,16 @@ TEST_F(Model, ADeliberateTeardownNeverRestarts) {
   EXPECT_TRUE(lines().empty());
   EXPECT_FALSE(model_->isRunning());
   EXPECT_EQ(loop_.timerCount(), 0u);
-  EXPECT_FALSE(service_.localPorts[0]->isValid());
-  EXPECT_FALSE(service_.remotePorts[0]->isValid());
+  EXPECT_FALSE(service_.localPorts_[0]->isValid());
+  EXPECT_FALSE(service_.remotePorts_[0]->isValid());
   loop_.advanceBy(30s);
-  EXPECT_EQ(service_.connectionsOpened, 1);
+  EXPECT_EQ(service_.connectionsOpened_, 1);
 }
 
 TEST_F(Model, TheRemotePortDyingIsNoticedWithinOneTickAndRestartsTheMonitor) {
   startRunning();
-  const std::string invalidated = " ***** INVALIDATED " + log::pointerText(service_.localPorts[0].get()) + " *****";
-  service_.alive = false;
+  const std::string invalidated = " ***** INVALIDATED " + log::pointerText(service_.localPorts_[0].get()) + " *****";
+  service_.alive_ = false;
   loop_.advanceBy(1999ms);
   EXPECT_EQ(count(invalidated), 0u);
   loop_.advanceBy(1ms);
@@ -260,33 +260,33 @@ TEST_F(Model, TheRemotePortDyingIsNoticedWithinOneTickAndRestartsTheMonitor) {
   EXPECT_FALSE(model_->isRunning());
   EXPECT_EQ(loop_.timerCount(), 0u);
 
-  service_.alive = true;
+  service_.alive_ = true;
   loop_.advanceBy(5s);
   EXPECT_TRUE(model_->isRunning());
-  EXPECT_EQ(service_.localPorts.size(), 3u);
+  EXPECT_EQ(service_.localPorts_.size(), 3u);
   EXPECT_EQ(count(invalidated), 1u);
 }
 
 TEST_F(Model, ThePreviousGeneratorIsReusedWhenTheTechnologyQueryFailsOnAReconnect) {
   startRunning();
   LogGenerator* first = model_->logGenerator();
-  service_.technologyStatus = kPortReceiveTimeout;
-  service_.alive = false;
+  service_.technologyStatus_ = kPortReceiveTimeout;
+  service_.alive_ = false;
   loop_.advanceBy(2s);
-  service_.alive = true;
+  service_.alive_ = true;
   loop_.advanceBy(5s);
   EXPECT_EQ(count(" ***** Could not send the GetTechnology command (got error=-2)"), 1u);
   EXPECT_EQ(count("No log generator technology works"), 0u);
   EXPECT_TRUE(model_->isRunning());
   EXPECT_EQ(model_->logGenerator(), first);
-  EXPECT_EQ(service_.commands.back().command, D({{"SetState", S("Streaming")}})) << "start command sent again";
+  EXPECT_EQ(service_.commands_.back().command, D({{"SetState", S("Streaming")}})) << "start command sent again";
 }
 
 TEST_F(Model, PacketsWithinOnePeriodGiveOneUpdateOneDisplayAndOneSnapshot) {
   startRunning();
   for (int i = 0; i < 10; ++i) service_.sendPacket(packet(std::to_string(60 + i)));
   loop_.advanceBy(2s);
-  EXPECT_EQ(delegate_.updates, 1);
+  EXPECT_EQ(delegate_.updates_, 1);
   EXPECT_EQ(historySize(), 0u) << "generated only when the screens ask";
   NodeRef root = model_->topLevelNodes();
   ASSERT_NE(root, nullptr);
@@ -302,7 +302,7 @@ TEST_F(Model, NoPacketsForALongTimeGenerateNothing) {
   model_->topLevelNodes();
   const NodeRef root = model_->topLevelNodes();
   loop_.advanceBy(std::chrono::hours(1));
-  EXPECT_EQ(delegate_.updates, 1);
+  EXPECT_EQ(delegate_.updates_, 1);
   EXPECT_EQ(historySize(), 1u);
   EXPECT_EQ(model_->topLevelNodes(), root);
 }
@@ -314,7 +314,7 @@ TEST_F(Model, ANewTickAfterNewPacketsDropsTheTreeAndTheNextRequestRebuildsIt) {
   const NodeRef first = model_->topLevelNodes();
   service_.sendPacket(packet("63"));
   loop_.advanceBy(2s);
-  EXPECT_EQ(delegate_.updates, 2);
+  EXPECT_EQ(delegate_.updates_, 2);
   EXPECT_NE(model_->topLevelNodes(), first);
   EXPECT_EQ(*model_->nodeAtPath("/Serving")->value(), "63");
   EXPECT_EQ(historySize(), 2u);
@@ -336,7 +336,7 @@ TEST_F(Model, WithoutAGeneratorThereAreNoNodesAndNoSaveContents) {
   EXPECT_TRUE(model_->getSaveContents().isNull());
   model_->updateWithData(packet("62"));  // no generator: nothing decoded, but it counts as new data
   loop_.advanceBy(2s);
-  EXPECT_EQ(delegate_.updates, 0) << "no timer runs before the monitor starts";
+  EXPECT_EQ(delegate_.updates_, 0) << "no timer runs before the monitor starts";
 }
 
 TEST_F(Model, SaveContentsComeFromTheGenerator) {
@@ -350,9 +350,9 @@ TEST_F(Model, SaveContentsComeFromTheGenerator) {
 }
 
 TEST_F(Model, ALogCodeTechnologyStreamsItsCodesAndSavesItsPacketsAsADlf) {
-  service_.technologyReply = FakeTelephony::replyFor("Quendra_LTE");
+  service_.technologyReply_ = FakeTelephony::replyFor("Quendra_LTE");
   startRunning();
-  const Dictionary& start = *service_.commands.back().command.asDictionary();
+  const Dictionary& start = *service_.commands_.back().command.asDictionary();
   EXPECT_EQ(*start.find("SetState")->asString(), "Streaming");
   const auto& extra = start.find("SetTsExtraCodes")->asArray()->elements();
   EXPECT_NE(std::find(extra.begin(), extra.end(), Value::integer(0)), extra.end());
@@ -384,9 +384,9 @@ TEST_F(Model, TheHistoryIsKeptAcrossAReconnect) {
   service_.sendPacket(packet("62"));
   loop_.advanceBy(2s);
   model_->topLevelNodes();
-  service_.alive = false;
+  service_.alive_ = false;
   loop_.advanceBy(2s);
-  service_.alive = true;
+  service_.alive_ = true;
   loop_.advanceBy(5s);
   ASSERT_TRUE(model_->isRunning());
   service_.sendPacket(packet("63"));
@@ -398,25 +398,25 @@ TEST_F(Model, TheHistoryIsKeptAcrossAReconnect) {
 TEST_F(Model, ANotificationOfTheConnectionRefreshes) {
   startRunning();
   service_.sendPacket(packet("62"));
-  ASSERT_TRUE(service_.lastNotificationCallback);
+  ASSERT_TRUE(service_.lastNotificationCallback_);
   test::FakeConnection connection(service_);
-  service_.lastNotificationCallback(connection, "AnyNotification", Value());
+  service_.lastNotificationCallback_(connection, "AnyNotification", Value());
   loop_.runPending();
-  EXPECT_EQ(delegate_.updates, 1);
+  EXPECT_EQ(delegate_.updates_, 1);
 }
 
 TEST_F(Model, RestartTearsDownAndStartsAgain) {
   startRunning();
   model_->restartMonitor();
   EXPECT_TRUE(model_->isRunning());
-  EXPECT_EQ(service_.connectionsOpened, 2);
-  EXPECT_FALSE(service_.localPorts[0]->isValid());
+  EXPECT_EQ(service_.connectionsOpened_, 2);
+  EXPECT_FALSE(service_.localPorts_[0]->isValid());
   EXPECT_EQ(loop_.timerCount(), 1u);
-  EXPECT_EQ(count(" ***** INVALIDATED " + log::pointerText(service_.localPorts[0].get()) + " *****"), 0u);
+  EXPECT_EQ(count(" ***** INVALIDATED " + log::pointerText(service_.localPorts_[0].get()) + " *****"), 0u);
 }
 
 TEST_F(Model, AModelDestroyedWithARetryPendingLeavesNothingBehind) {
-  service_.reachable = false;
+  service_.reachable_ = false;
   model_->startMonitor();
   service_.sendPacket(packet("62"));
   model_.reset();
@@ -429,7 +429,7 @@ TEST_F(Model, TheDisplayTimerTicksEveryTwoSeconds) {
   for (int tick = 1; tick <= 3; ++tick) {
     service_.sendPacket(packet("62"));
     loop_.advanceBy(2s);
-    EXPECT_EQ(delegate_.updates, tick);
+    EXPECT_EQ(delegate_.updates_, tick);
   }
 }
 

@@ -78,22 +78,22 @@ class FakeRemotePort final : public FakePort<RemoteMessagePort> {
 class FakeTelephony final : public MessagePortSystem, public TelephonyClient {
  public:
   // Knobs, each for one way the channel can fail.
-  bool reachable = true;
-  std::int32_t channelErrorCode = 0;
-  std::string commandPortName = "CorvaneTS.1";
-  bool remotePortCreatable = true;
-  std::int32_t technologyStatus = kPortSuccess;
-  std::optional<Bytes> technologyReply = replyFor("IFX");
-  std::int32_t startStatus = kPortSuccess;
-  bool alive = true;  // false: the service has died and its ports are invalid
+  bool reachable_ = true;
+  std::int32_t channelErrorCode_ = 0;
+  std::string commandPortName_ = "CorvaneTS.1";
+  bool remotePortCreatable_ = true;
+  std::int32_t technologyStatus_ = kPortSuccess;
+  std::optional<Bytes> technologyReply_ = replyFor("IFX");
+  std::int32_t startStatus_ = kPortSuccess;
+  bool alive_ = true;  // false: the service has died and its ports are invalid
 
   // What happened.
-  std::vector<SentCommand> commands;
-  std::vector<std::string> channelRequests;  // local port names
-  int connectionsOpened = 0;
-  std::vector<std::shared_ptr<FakeLocalPort>> localPorts;
-  std::vector<std::shared_ptr<FakeRemotePort>> remotePorts;
-  TelephonyClient::NotificationCallback lastNotificationCallback;
+  std::vector<SentCommand> commands_;
+  std::vector<std::string> channelRequests_;  // local port names
+  int connectionsOpened_ = 0;
+  std::vector<std::shared_ptr<FakeLocalPort>> localPorts_;
+  std::vector<std::shared_ptr<FakeRemotePort>> remotePorts_;
+  TelephonyClient::NotificationCallback lastNotificationCallback_;
 
   static Bytes replyFor(const std::string& technology) {
     Dictionary reply;
@@ -103,19 +103,19 @@ class FakeTelephony final : public MessagePortSystem, public TelephonyClient {
 
   // Sends a packet to the newest local port, as the service streams it.
   std::optional<Bytes> sendPacket(const Bytes& packet, MessageId id = 0) {
-    return localPorts.back()->deliver(id, packet);
+    return localPorts_.back()->deliver(id, packet);
   }
 
   std::shared_ptr<LocalMessagePort> createLocalPort(const std::string& name, LocalMessagePort::Callback callback) override {
     auto port = std::make_shared<FakeLocalPort>(name, std::move(callback));
-    localPorts.push_back(port);
+    localPorts_.push_back(port);
     return port;
   }
 
   std::shared_ptr<RemoteMessagePort> createRemotePort(const std::string& name) override {
-    if (!remotePortCreatable || !alive) return nullptr;
+    if (!remotePortCreatable_ || !alive_) return nullptr;
     auto port = std::make_shared<FakeRemotePort>(name, *this);
-    remotePorts.push_back(port);
+    remotePorts_.push_back(port);
     return port;
   }
 
@@ -126,9 +126,9 @@ class FakeConnection final : public TelephonyConnection {
  public:
   explicit FakeConnection(FakeTelephony& service) : service_(service) {}
   TelephonyError NetworkMonitorCreateLogChannel(const std::string& localPortName, std::string& remotePortName) override {
-    service_.channelRequests.push_back(localPortName);
-    if (service_.channelErrorCode != 0) return {1, service_.channelErrorCode};
-    remotePortName = service_.commandPortName;
+    service_.channelRequests_.push_back(localPortName);
+    if (service_.channelErrorCode_ != 0) return {1, service_.channelErrorCode_};
+    remotePortName = service_.commandPortName_;
     return {};
   }
 
@@ -137,24 +137,24 @@ class FakeConnection final : public TelephonyConnection {
 };
 
 inline std::unique_ptr<TelephonyConnection> FakeTelephony::TelephonyServerConnectionCreate(NotificationCallback callback) {
-  if (!reachable || !alive) return nullptr;
-  ++connectionsOpened;
-  lastNotificationCallback = std::move(callback);
+  if (!reachable_ || !alive_) return nullptr;
+  ++connectionsOpened_;
+  lastNotificationCallback_ = std::move(callback);
   return std::make_unique<FakeConnection>(*this);
 }
 
-inline bool FakeRemotePort::isValid() const { return valid_ && service_.alive; }
+inline bool FakeRemotePort::isValid() const { return valid_ && service_.alive_; }
 
 inline std::int32_t FakeRemotePort::sendRequest(MessageId id, std::span<const std::uint8_t> data, double sendTimeout,
                                                 double receiveTimeout, std::optional<Bytes>* reply) {
   if (!isValid()) return kPortIsInvalid;
   Value command = plist::parseOrThrow(data);
-  service_.commands.push_back({name_, id, command, sendTimeout, receiveTimeout, reply != nullptr});
+  service_.commands_.push_back({name_, id, command, sendTimeout, receiveTimeout, reply != nullptr});
   if (command.asDictionary() && command.asDictionary()->contains("GetTechnology")) {
-    if (reply) *reply = service_.technologyReply;
-    return service_.technologyStatus;
+    if (reply) *reply = service_.technologyReply_;
+    return service_.technologyStatus_;
   }
-  return service_.startStatus;
+  return service_.startStatus_;
 }
 
 }  // namespace corvane::test
