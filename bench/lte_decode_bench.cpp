@@ -181,10 +181,10 @@ std::shared_ptr<log::Sink> makeSink(SinkKind kind) {
 struct DecodingSetUp {
   DecodingSetUp() {
     log::setSink(std::make_shared<EveryLineSink>());
-    generator.getDisplayFromState(state);
+    generator_.getDisplayFromState(state_);
   }
-  LTELogGenerator generator;
-  Dictionary state;
+  LTELogGenerator generator_;
+  Dictionary state_;
 };
 
 void runPackets(benchmark::State& state, const std::vector<Bytes>& packets, SinkKind sink) {
@@ -192,7 +192,7 @@ void runPackets(benchmark::State& state, const std::vector<Bytes>& packets, Sink
   log::setSink(makeSink(sink));
   std::size_t next = 0;
   for (auto _ : state) {
-    setUp.generator.updateWithData(packets[next]);
+    setUp.generator_.updateWithData(packets[next]);
     if (++next == packets.size()) next = 0;
   }
   state.counters["packets_per_second"] =
@@ -226,11 +226,11 @@ void BM_LteUpdateStateMix(benchmark::State& state) {
   std::size_t next = 0;
   std::size_t sinceDisplay = 0;
   for (auto _ : state) {
-    setUp.generator.updateState(setUp.state, packets[next]);
+    setUp.generator_.updateState(setUp.state_, packets[next]);
     if (++next == packets.size()) next = 0;
     if (++sinceDisplay == 100000) {
       state.PauseTiming();
-      setUp.generator.generateLogUsingState(setUp.state);
+      setUp.generator_.generateLogUsingState(setUp.state_);
       sinceDisplay = 0;
       state.ResumeTiming();
     }

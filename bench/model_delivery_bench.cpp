@@ -48,12 +48,12 @@ class TimingGenerator final : public LogGenerator {
  public:
   explicit TimingGenerator(std::unique_ptr<LogGenerator> inner) : inner_(std::move(inner)) {}
   void updateState(const Dictionary& state, std::span<const std::uint8_t> data) override {
-    if (packets == 0) first = Clock::now();
-    ++packets;
-    bytes += data.size();
-    last = Clock::now();
+    if (packets_ == 0) first_ = Clock::now();
+    ++packets_;
+    bytes_ += data.size();
+    last_ = Clock::now();
     if (inner_) inner_->updateState(state, data);
-    if (packets == target) QCoreApplication::quit();
+    if (packets_ == target_) QCoreApplication::quit();
   }
   Value generateLogUsingState(const Dictionary& state) override {
     return inner_ ? inner_->generateLogUsingState(state) : Value();
@@ -61,10 +61,10 @@ class TimingGenerator final : public LogGenerator {
   Dictionary getStartCommand() override { return GSMLogGenerator().getStartCommand(); }
   Value getSaveContentsFromState(const Dictionary&) override { return Value(); }
 
-  static inline unsigned long long target = 0;
-  static inline unsigned long long packets = 0;
-  static inline unsigned long long bytes = 0;
-  static inline Clock::time_point first, last;
+  static inline unsigned long long target_ = 0;
+  static inline unsigned long long packets_ = 0;
+  static inline unsigned long long bytes_ = 0;
+  static inline Clock::time_point first_, last_;
 
  private:
   std::unique_ptr<LogGenerator> inner_;
@@ -75,8 +75,8 @@ struct NoScreens final : CorvaneModelDelegate {
 };
 
 int run(const std::string& daemon, const std::filesystem::path& runtime, unsigned long long packets, bool decode) {
-  TimingGenerator::target = packets;
-  TimingGenerator::packets = TimingGenerator::bytes = 0;
+  TimingGenerator::target_ = packets;
+  TimingGenerator::packets_ = TimingGenerator::bytes_ = 0;
 
   const pid_t pid = fork();
   if (pid == 0) {
@@ -105,13 +105,13 @@ int run(const std::string& daemon, const std::filesystem::path& runtime, unsigne
   kill(pid, SIGTERM);
   waitpid(pid, nullptr, 0);
 
-  const double seconds = std::chrono::duration<double>(TimingGenerator::last - TimingGenerator::first).count();
+  const double seconds = std::chrono::duration<double>(TimingGenerator::last_ - TimingGenerator::first_).count();
   std::printf("%-22s %10llu of %llu packets, %6.1f MB, %7.3f s: %12.0f packets/s%s\n",
-              decode ? "IFX decoder" : "counting generator", TimingGenerator::packets, packets,
-              static_cast<double>(TimingGenerator::bytes) / 1e6, seconds,
-              seconds > 0 ? static_cast<double>(TimingGenerator::packets - 1) / seconds : 0.0,
-              TimingGenerator::packets == packets ? "" : "  (PACKETS LOST)");
-  return TimingGenerator::packets == packets ? 0 : 1;
+              decode ? "IFX decoder" : "counting generator", TimingGenerator::packets_, packets,
+              static_cast<double>(TimingGenerator::bytes_) / 1e6, seconds,
+              seconds > 0 ? static_cast<double>(TimingGenerator::packets_ - 1) / seconds : 0.0,
+              TimingGenerator::packets_ == packets ? "" : "  (PACKETS LOST)");
+  return TimingGenerator::packets_ == packets ? 0 : 1;
 }
 
 }  // namespace

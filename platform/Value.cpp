@@ -18,19 +18,19 @@ constexpr std::size_t kIndexThreshold = 12;
 struct Dictionary::Storage {
   using Index = std::unordered_map<std::string, std::size_t, KeyHash, std::equal_to<>>;
 
-  std::vector<Entry> entries;
-  std::unique_ptr<Index> index;
+  std::vector<Entry> entries_;
+  std::unique_ptr<Index> index_;
 
   Storage() = default;
-  Storage(const Storage& other) : entries(other.entries) { rebuildIndex(); }
+  Storage(const Storage& other) : entries_(other.entries_) { rebuildIndex(); }
 
   std::ptrdiff_t position(std::string_view key) const {
-    if (index) {
-      auto it = index->find(key);
-      return it == index->end() ? -1 : static_cast<std::ptrdiff_t>(it->second);
+    if (index_) {
+      auto it = index_->find(key);
+      return it == index_->end() ? -1 : static_cast<std::ptrdiff_t>(it->second);
     }
-    for (std::size_t i = 0; i < entries.size(); ++i) {
-      if (entries[i].first == key) return static_cast<std::ptrdiff_t>(i);
+    for (std::size_t i = 0; i < entries_.size(); ++i) {
+      if (entries_[i].first == key) return static_cast<std::ptrdiff_t>(i);
     }
     return -1;
   }
@@ -39,33 +39,33 @@ struct Dictionary::Storage {
   // behind it.
   Value* findFrom(std::string_view key, std::size_t& next) {
     std::ptrdiff_t at = -1;
-    if (next < entries.size() && entries[next].first == key) {
+    if (next < entries_.size() && entries_[next].first == key) {
       at = static_cast<std::ptrdiff_t>(next);
     } else {
       at = position(key);
     }
     if (at < 0) return nullptr;
     next = static_cast<std::size_t>(at) + 1;
-    return &entries[static_cast<std::size_t>(at)].second;
+    return &entries_[static_cast<std::size_t>(at)].second;
   }
 
   void append(std::string_view key, Value value) {
-    entries.emplace_back(std::string(key), std::move(value));
-    if (index) {
-      index->emplace(entries.back().first, entries.size() - 1);
-    } else if (entries.size() > kIndexThreshold) {
+    entries_.emplace_back(std::string(key), std::move(value));
+    if (index_) {
+      index_->emplace(entries_.back().first, entries_.size() - 1);
+    } else if (entries_.size() > kIndexThreshold) {
       rebuildIndex();
     }
   }
 
   void rebuildIndex() {
-    if (entries.size() <= kIndexThreshold) {
-      index.reset();
+    if (entries_.size() <= kIndexThreshold) {
+      index_.reset();
       return;
     }
-    index = std::make_unique<Index>();
-    index->reserve(entries.size());
-    for (std::size_t i = 0; i < entries.size(); ++i) index->emplace(entries[i].first, i);
+    index_ = std::make_unique<Index>();
+    index_->reserve(entries_.size());
+    for (std::size_t i = 0; i < entries_.size(); ++i) index_->emplace(entries_[i].first, i);
   }
 };
 
@@ -82,16 +82,16 @@ std::optional<Dictionary> Dictionary::Weak::lock() const {
   return std::nullopt;
 }
 
-std::size_t Dictionary::size() const { return storage_->entries.size(); }
+std::size_t Dictionary::size() const { return storage_->entries_.size(); }
 
 const Value* Dictionary::find(std::string_view key) const {
   const std::ptrdiff_t pos = storage_->position(key);
-  return pos < 0 ? nullptr : &storage_->entries[static_cast<std::size_t>(pos)].second;
+  return pos < 0 ? nullptr : &storage_->entries_[static_cast<std::size_t>(pos)].second;
 }
 
 Value* Dictionary::findMutable(std::string_view key) const {
   const std::ptrdiff_t pos = storage_->position(key);
-  return pos < 0 ? nullptr : &storage_->entries[static_cast<std::size_t>(pos)].second;
+  return pos < 0 ? nullptr : &storage_->entries_[static_cast<std::size_t>(pos)].second;
 }
 
 Value Dictionary::get(std::string_view key) const {
@@ -113,14 +113,14 @@ void Dictionary::set(std::string_view key, Value value, std::size_t& next) const
     return;
   }
   storage_->append(key, std::move(value));
-  next = storage_->entries.size();
+  next = storage_->entries_.size();
 }
 
 void Dictionary::setString(std::string_view key, std::string_view text, std::size_t& next) const {
   Value* existing = storage_->findFrom(key, next);
   if (!existing) {
     storage_->append(key, Value(text));
-    next = storage_->entries.size();
+    next = storage_->entries_.size();
   } else if (auto* string = std::get_if<std::string>(&existing->v_)) {
     // A text of the same length, as a value rewritten on every update mostly
     // is, and a first text into an empty string take the short ways.
@@ -139,26 +139,26 @@ void Dictionary::setString(std::string_view key, std::string_view text, std::siz
 bool Dictionary::remove(std::string_view key) const {
   const std::ptrdiff_t pos = storage_->position(key);
   if (pos < 0) return false;
-  storage_->entries.erase(storage_->entries.begin() + pos);
+  storage_->entries_.erase(storage_->entries_.begin() + pos);
   storage_->rebuildIndex();
   return true;
 }
 
 void Dictionary::clear() const {
-  storage_->entries.clear();
-  storage_->index.reset();
+  storage_->entries_.clear();
+  storage_->index_.reset();
 }
 
-void Dictionary::reserve(std::size_t count) const { storage_->entries.reserve(count); }
+void Dictionary::reserve(std::size_t count) const { storage_->entries_.reserve(count); }
 
-const std::vector<Dictionary::Entry>& Dictionary::entries() const { return storage_->entries; }
+const std::vector<Dictionary::Entry>& Dictionary::entries() const { return storage_->entries_; }
 
 Dictionary Dictionary::shallowCopy() const { return Dictionary(std::make_shared<Storage>(*storage_)); }
 
 Dictionary Dictionary::deepCopy() const {
   Dictionary copy;
   copy.reserve(size());
-  for (const auto& [key, value] : storage_->entries) copy.set(key, value.deepCopy());
+  for (const auto& [key, value] : storage_->entries_) copy.set(key, value.deepCopy());
   return copy;
 }
 

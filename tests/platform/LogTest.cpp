@@ -41,9 +41,9 @@ TEST(Log, TeeSinkWritesToEverySink) {
 // Takes only failures (levels 0-3), as a sink that ignores traces would.
 class ErrorsOnlySink final : public log::Sink {
  public:
-  void write(int priority, std::string_view text) override { lines.push_back({priority, std::string(text)}); }
+  void write(int priority, std::string_view text) override { lines_.push_back({priority, std::string(text)}); }
   bool wants(int priority) const override { return priority <= log::kError; }
-  std::vector<log::Line> lines;
+  std::vector<log::Line> lines_;
 };
 
 TEST(Log, LinesTheSinkDoesNotWantAreNeverHandedToIt) {
@@ -57,7 +57,7 @@ TEST(Log, LinesTheSinkDoesNotWantAreNeverHandedToIt) {
   EXPECT_FALSE(log::wants(log::kWarning));
   EXPECT_TRUE(log::wants(log::kError));
   log::setSink(previous);
-  EXPECT_EQ(errors->lines, (std::vector<log::Line>{{3, "failure 2"}, {3, "failure"}}));
+  EXPECT_EQ(errors->lines_, (std::vector<log::Line>{{3, "failure 2"}, {3, "failure"}}));
 }
 
 TEST(Log, ATeeWantsWhatAnyOfItsSinksWantsAndHandsEachOnlyThat) {
@@ -68,7 +68,7 @@ TEST(Log, ATeeWantsWhatAnyOfItsSinksWantsAndHandsEachOnlyThat) {
   tee.write(log::kWarning, "trace");
   tee.write(log::kError, "failure");
   EXPECT_EQ(all->texts(), (std::vector<std::string>{"trace", "failure"}));
-  EXPECT_EQ(errors->lines, (std::vector<log::Line>{{3, "failure"}}));
+  EXPECT_EQ(errors->lines_, (std::vector<log::Line>{{3, "failure"}}));
   EXPECT_FALSE(log::TeeSink({errors}).wants(log::kWarning));
 }
 

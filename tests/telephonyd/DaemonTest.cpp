@@ -111,9 +111,9 @@ class Client {
     static int counter = 0;
     localName_ = "CorvaneApp.test-" + std::to_string(::getpid()) + "-" + std::to_string(++counter);
     local_ = ports.createLocalPort(localName_, [this](LocalMessagePort&, MessageId id, const Bytes& data) {
-      ids.push_back(id);
-      last = data;
-      if (keepAll) all.push_back(data);
+      ids_.push_back(id);
+      last_ = data;
+      if (keepAll_) all_.push_back(data);
       return std::optional<Bytes>();
     });
     if (!local_) return;
@@ -149,10 +149,10 @@ class Client {
     return remote_->sendRequest(0, plist::serializeOrThrow(Value(fields), plist::Format::XML), 1.0, 0.0, nullptr);
   }
 
-  std::vector<MessageId> ids;
-  Bytes last;
-  bool keepAll = false;
-  std::vector<Bytes> all;
+  std::vector<MessageId> ids_;
+  Bytes last_;
+  bool keepAll_ = false;
+  std::vector<Bytes> all_;
 
  private:
   SocketPortSystem& ports_;
@@ -180,14 +180,14 @@ const Value* findKey(const Value& tree, std::string_view key) {
 
 class DaemonTest : public ::testing::Test {
  protected:
-  void SetUp() override { ASSERT_TRUE(runtime.result().ok()) << runtime.result().error; }
+  void SetUp() override { ASSERT_TRUE(runtime_.result().ok()) << runtime_.result().error; }
 
   // Lets the clients' ports read what has arrived until the condition holds.
   template <typename Condition>
   bool pumpUntil(Condition condition, std::chrono::milliseconds limit = 3000ms) {
     const auto giveUp = Clock::now() + limit;
     for (;;) {
-      loop.pollWatches();
+      loop_.pollWatches();
       if (condition()) return true;
       if (Clock::now() > giveUp) return false;
       std::this_thread::sleep_for(1ms);
@@ -197,38 +197,38 @@ class DaemonTest : public ::testing::Test {
     pumpUntil([] { return false; }, duration);
   }
 
-  test::RuntimeTestDirectory runtime;
-  SocketPortSystem ports{runtime.result().path};
-  VirtualRunLoop loop;
+  test::RuntimeTestDirectory runtime_;
+  SocketPortSystem ports_{runtime_.result().path};
+  VirtualRunLoop loop_;
 };
 
 TEST_F(DaemonTest, GetTechnologyIsAnsweredWithTheSimulatedTechnology) {
-  Daemon daemon(ports, {});
-  Client client(ports, loop);
+  Daemon daemon(ports_, {});
+  Client client(ports_, loop_);
   ASSERT_TRUE(client.connected());
   EXPECT_EQ(client.technology(), "IFX");
-  EXPECT_TRUE(client.ids.empty());
+  EXPECT_TRUE(client.ids_.empty());
 }
 
 TEST_F(DaemonTest, NothingIsStreamedBeforeTheStartCommand) {
-  Daemon daemon(ports, {"--rate", "1000"});
-  Client client(ports, loop);
+  Daemon daemon(ports_, {"--rate", "1000"});
+  Client client(ports_, loop_);
   ASSERT_TRUE(client.connected());
   pumpFor(100ms);
-  EXPECT_TRUE(client.ids.empty());
+  EXPECT_TRUE(client.ids_.empty());
 }
 
 TEST_F(DaemonTest, StartCommandStreamsDecodablePacketsWithMessageIdZero) {
-  Daemon daemon(ports, {"--rate", "500"});
-  Client client(ports, loop);
+  Daemon daemon(ports_, {"--rate", "500"});
+  Client client(ports_, loop_);
   ASSERT_TRUE(client.connected());
   ASSERT_EQ(client.technology(), "IFX");
   ASSERT_EQ(client.start(), kPortSuccess);
-  ASSERT_TRUE(pumpUntil([&] { return client.ids.size() >= 20; }));
-  for (MessageId id : client.ids) EXPECT_EQ(id, 0);
+  ASSERT_TRUE(pumpUntil([&] { return client.ids_.size() >= 20; }));
+  for (MessageId id : client.ids_) EXPECT_EQ(id, 0);
   GSMLogGenerator generator;
   Dictionary state;
-  generator.updateState(state, client.last);
+  generator.updateState(state, client.last_);
   const Value display = generator.generateLogUsingState(state);
   ASSERT_TRUE(display.asDictionary());
   EXPECT_TRUE(display.asDictionary()->contains("Serving Cell"));
@@ -253,16 +253,16 @@ std::uint32_t effectiveCode(const Bytes& packet) {
 }
 
 TEST_F(DaemonTest, LogCodeTechnologyStreamsOnlyTheCellListsThatTheStartCommandAsksFor) {
-  Daemon daemon(ports, {"--technology", "Quendra_LTE", "--rate", "max", "--packets", "30"});
-  Client client(ports, loop);
+  Daemon daemon(ports_, {"--technology", "Quendra_LTE", "--rate", "max", "--packets", "30"});
+  Client client(ports_, loop_);
   ASSERT_TRUE(client.connected());
-  client.keepAll = true;
+  client.keepAll_ = true;
   ASSERT_EQ(client.technology(), "Quendra_LTE");
   ASSERT_EQ(client.start(logCodeStart({}, {1})), kPortSuccess);
-  ASSERT_TRUE(pumpUntil([&] { return client.all.size() >= 30; }));
+  ASSERT_TRUE(pumpUntil([&] { return client.all_.size() >= 30; }));
   pumpFor(50ms);
-  ASSERT_EQ(client.all.size(), 30u);
-  for (const Bytes& packet : client.all) {
+  ASSERT_EQ(client.all_.size(), 30u);
+  for (const Bytes& packet : client.all_) {
     ASSERT_GE(packet.size(), 13u);
     EXPECT_EQ(effectiveCode(packet), 0xFF0001u);
     EXPECT_EQ(packet[1] | packet[2] << 8, static_cast<int>(packet.size() - 1));
@@ -276,17 +276,17 @@ TEST_F(DaemonTest, LogCodeTechnologyStreamsOnlyTheCellListsThatTheStartCommandAs
 }
 
 TEST_F(DaemonTest, LteScenarioStreamsOnlyTheRadioRecordsThatTheStartCommandAsksFor) {
-  Daemon daemon(ports, {"--technology", "Quendra_LTE", "--rate", "max", "--packets", "40"});
-  Client client(ports, loop);
+  Daemon daemon(ports_, {"--technology", "Quendra_LTE", "--rate", "max", "--packets", "40"});
+  Client client(ports_, loop_);
   ASSERT_TRUE(client.connected());
-  client.keepAll = true;
+  client.keepAll_ = true;
   ASSERT_EQ(client.technology(), "Quendra_LTE");
   ASSERT_EQ(client.start(logCodeStart({0xB17F, 0xB186}, {})), kPortSuccess);
-  ASSERT_TRUE(pumpUntil([&] { return client.all.size() >= 40; }));
+  ASSERT_TRUE(pumpUntil([&] { return client.all_.size() >= 40; }));
   pumpFor(50ms);
-  ASSERT_EQ(client.all.size(), 40u);
+  ASSERT_EQ(client.all_.size(), 40u);
   std::set<std::uint32_t> codes;
-  for (const Bytes& packet : client.all) {
+  for (const Bytes& packet : client.all_) {
     ASSERT_GE(packet.size(), 13u);
     EXPECT_EQ(packet[0], 0x01);
     EXPECT_EQ(packet[1] | packet[2] << 8, static_cast<int>(packet.size() - 1));
@@ -297,26 +297,26 @@ TEST_F(DaemonTest, LteScenarioStreamsOnlyTheRadioRecordsThatTheStartCommandAsksF
 }
 
 TEST_F(DaemonTest, StartCommandWithAnotherTechnologysCodesGetsNothingOfThem) {
-  Daemon daemon(ports, {"--technology", "Quendra_UTRAN2", "--rate", "max"});
-  Client client(ports, loop);
+  Daemon daemon(ports_, {"--technology", "Quendra_UTRAN2", "--rate", "max"});
+  Client client(ports_, loop_);
   ASSERT_TRUE(client.connected());
   ASSERT_EQ(client.technology(), "Quendra_UTRAN2");
   // The LTE generator's log codes, without extra codes.
   ASSERT_EQ(client.start(logCodeStart({0xB0C2, 0xB0C1, 0xB179, 0xB17F, 0xB180, 0xB186}, {})), kPortSuccess);
   pumpFor(300ms);
-  EXPECT_TRUE(client.ids.empty());
+  EXPECT_TRUE(client.ids_.empty());
   EXPECT_TRUE(daemon.running());
 }
 
 TEST_F(DaemonTest, LogCodePacketsTravelToTheDecodeToolsReadersAndDecoderUnchanged) {
-  Daemon daemon(ports, {"--technology", "Quendra_GSM", "--rate", "max", "--packets", "40", "--seed", "3",
+  Daemon daemon(ports_, {"--technology", "Quendra_GSM", "--rate", "max", "--packets", "40", "--seed", "3",
                         "--clock-start", "1800000000"});
-  Client client(ports, loop);
+  Client client(ports_, loop_);
   ASSERT_TRUE(client.connected());
-  client.keepAll = true;
+  client.keepAll_ = true;
   ASSERT_EQ(client.start(logCodeStart({0x5134, 0x4005}, {0, 1, 2})), kPortSuccess);
-  ASSERT_TRUE(pumpUntil([&] { return client.all.size() >= 40; }));
-  const std::vector<Bytes>& packets = client.all;
+  ASSERT_TRUE(pumpUntil([&] { return client.all_.size() >= 40; }));
+  const std::vector<Bytes>& packets = client.all_;
   ASSERT_EQ(packets.size(), 40u);
   // The first period: SIM files, cell list, PDP contexts, at the start of the clock.
   EXPECT_EQ(effectiveCode(packets[0]), 0xFF0000u);
@@ -382,99 +382,99 @@ TEST_F(DaemonTest, LogCodePacketsTravelToTheDecodeToolsReadersAndDecoderUnchange
 }
 
 TEST_F(DaemonTest, PacketLimitIsHonouredExactly) {
-  Daemon daemon(ports, {"--rate", "max", "--packets", "5000"});
-  Client client(ports, loop);
+  Daemon daemon(ports_, {"--rate", "max", "--packets", "5000"});
+  Client client(ports_, loop_);
   ASSERT_TRUE(client.connected());
   ASSERT_EQ(client.start(), kPortSuccess);
-  ASSERT_TRUE(pumpUntil([&] { return client.ids.size() >= 5000; }));
+  ASSERT_TRUE(pumpUntil([&] { return client.ids_.size() >= 5000; }));
   pumpFor(50ms);
-  EXPECT_EQ(client.ids.size(), 5000u);
+  EXPECT_EQ(client.ids_.size(), 5000u);
 }
 
 TEST_F(DaemonTest, TwoClientsAreServedAtOnce) {
-  Daemon daemon(ports, {"--rate", "200"});
-  Client first(ports, loop);
-  Client second(ports, loop);
+  Daemon daemon(ports_, {"--rate", "200"});
+  Client first(ports_, loop_);
+  Client second(ports_, loop_);
   ASSERT_TRUE(first.connected() && second.connected());
   EXPECT_NE(first.commandPortName(), second.commandPortName());
   ASSERT_EQ(first.start(), kPortSuccess);
   ASSERT_EQ(second.start(), kPortSuccess);
   EXPECT_EQ(second.technology(), "IFX");
-  ASSERT_TRUE(pumpUntil([&] { return first.ids.size() >= 10 && second.ids.size() >= 10; }));
+  ASSERT_TRUE(pumpUntil([&] { return first.ids_.size() >= 10 && second.ids_.size() >= 10; }));
 }
 
 TEST_F(DaemonTest, ClientThatVanishesMidStreamDoesNotStopTheService) {
-  Daemon daemon(ports, {"--rate", "max"});
+  Daemon daemon(ports_, {"--rate", "max"});
   {
-    Client doomed(ports, loop);
+    Client doomed(ports_, loop_);
     ASSERT_TRUE(doomed.connected());
     ASSERT_EQ(doomed.start(), kPortSuccess);
-    ASSERT_TRUE(pumpUntil([&] { return doomed.ids.size() >= 1000; }));
+    ASSERT_TRUE(pumpUntil([&] { return doomed.ids_.size() >= 1000; }));
     // Leaves without a word: its sockets simply close, as when a process dies.
   }
   // Its channel goes; only the well-known socket is left.
-  ASSERT_TRUE(pumpUntil([&] { return serviceSockets(runtime.path()).size() == 1; }));
+  ASSERT_TRUE(pumpUntil([&] { return serviceSockets(runtime_.path()).size() == 1; }));
   EXPECT_TRUE(daemon.running());
 
-  Client next(ports, loop);
+  Client next(ports_, loop_);
   ASSERT_TRUE(next.connected());
   EXPECT_EQ(next.technology(), "IFX");
   ASSERT_EQ(next.start(), kPortSuccess);
-  ASSERT_TRUE(pumpUntil([&] { return next.ids.size() >= 1000; }));
+  ASSERT_TRUE(pumpUntil([&] { return next.ids_.size() >= 1000; }));
 }
 
 TEST_F(DaemonTest, ChannelWhoseLocalPortHasGoneIsClosedAndItsCommandPortBecomesInvalid) {
-  Daemon daemon(ports, {"--rate", "200"});
-  Client client(ports, loop);
+  Daemon daemon(ports_, {"--rate", "200"});
+  Client client(ports_, loop_);
   ASSERT_TRUE(client.connected());
   ASSERT_EQ(client.start(), kPortSuccess);
-  ASSERT_TRUE(pumpUntil([&] { return !client.ids.empty(); }));
+  ASSERT_TRUE(pumpUntil([&] { return !client.ids_.empty(); }));
   client.local().invalidate();
   ASSERT_TRUE(pumpUntil([&] { return !client.remote().isValid(); }));
   EXPECT_TRUE(daemon.running());
 }
 
 TEST_F(DaemonTest, SigtermShutsDownCleanlyAndRemovesTheSockets) {
-  Daemon daemon(ports, {"--rate", "200"});
-  Client client(ports, loop);
+  Daemon daemon(ports_, {"--rate", "200"});
+  Client client(ports_, loop_);
   ASSERT_TRUE(client.connected());
   ASSERT_EQ(client.start(), kPortSuccess);
-  EXPECT_EQ(serviceSockets(runtime.path()).size(), 2u);
+  EXPECT_EQ(serviceSockets(runtime_.path()).size(), 2u);
   EXPECT_EQ(daemon.stop(SIGTERM), 0);
-  EXPECT_TRUE(serviceSockets(runtime.path()).empty());
+  EXPECT_TRUE(serviceSockets(runtime_.path()).empty());
   EXPECT_FALSE(client.remote().isValid());
 }
 
 TEST_F(DaemonTest, SigintShutsDownCleanlyToo) {
-  Daemon daemon(ports, {});
+  Daemon daemon(ports_, {});
   EXPECT_EQ(daemon.stop(SIGINT), 0);
-  EXPECT_TRUE(serviceSockets(runtime.path()).empty());
+  EXPECT_TRUE(serviceSockets(runtime_.path()).empty());
 }
 
 TEST_F(DaemonTest, SecondServiceOnALiveSocketIsRefused) {
-  Daemon daemon(ports, {});
+  Daemon daemon(ports_, {});
   const auto result = test::runProcess({kDaemon});
   EXPECT_EQ(result.exitCode, 1);
   EXPECT_EQ(result.err, "corvane-telephonyd: another corvane-telephonyd is already serving " +
-                            ports.socketPath(std::string(kTelephonyServicePortName)).string() + "\n");
+                            ports_.socketPath(std::string(kTelephonyServicePortName)).string() + "\n");
   EXPECT_TRUE(daemon.running());
-  Client client(ports, loop);
+  Client client(ports_, loop_);
   EXPECT_TRUE(client.connected());
 }
 
 TEST_F(DaemonTest, StaleSocketFileIsReplaced) {
-  const std::string path = ports.socketPath(std::string(kTelephonyServicePortName)).string();
+  const std::string path = ports_.socketPath(std::string(kTelephonyServicePortName)).string();
   ASSERT_TRUE(test::leaveStaleSocket(path));
-  Daemon daemon(ports, {});
+  Daemon daemon(ports_, {});
   EXPECT_TRUE(daemon.running());
-  Client client(ports, loop);
+  Client client(ports_, loop_);
   ASSERT_TRUE(client.connected());
   EXPECT_EQ(client.technology(), "IFX");
 }
 
 TEST_F(DaemonTest, LogChannelForAnUnusablePortNameIsRefused) {
-  Daemon daemon(ports, {});
-  SocketTelephonyClient telephony(ports);
+  Daemon daemon(ports_, {});
+  SocketTelephonyClient telephony(ports_);
   auto connection = telephony.TelephonyServerConnectionCreate(nullptr);
   ASSERT_TRUE(connection);
   std::string remote;
@@ -488,7 +488,7 @@ TEST_F(DaemonTest, BadOptionExitsWithStatus2AndOneLine) {
   const auto result = test::runProcess({kDaemon, "--bogus"});
   EXPECT_EQ(result.exitCode, 2);
   EXPECT_EQ(result.err, "corvane-telephonyd: unknown option '--bogus' (see --help)\n");
-  EXPECT_TRUE(serviceSockets(runtime.path()).empty());
+  EXPECT_TRUE(serviceSockets(runtime_.path()).empty());
 }
 
 TEST_F(DaemonTest, HelpAndVersionNameTheProgramAndExitWithStatus0) {
@@ -499,7 +499,7 @@ TEST_F(DaemonTest, HelpAndVersionNameTheProgramAndExitWithStatus0) {
   const auto version = test::runProcess({kDaemon, "--version"});
   EXPECT_EQ(version.exitCode, 0);
   EXPECT_EQ(version.out, std::string("corvane-telephonyd ") + kVersion + "\n");
-  EXPECT_TRUE(serviceSockets(runtime.path()).empty());
+  EXPECT_TRUE(serviceSockets(runtime_.path()).empty());
 }
 
 TEST_F(DaemonTest, TechnologyWithoutAScenarioIsAClearError) {

@@ -55,10 +55,10 @@ class LteSampleDecode : public ::testing::Test {
     ASSERT_EQ(r.exitCode, 0) << r.err;
     ASSERT_EQ(r.err, "");
     // The class indexes' teardown lines may follow the document on standard output.
-    tree = Json::parse(r.out.substr(0, r.out.rfind('}') + 1));
+    tree_ = Json::parse(r.out.substr(0, r.out.rfind('}') + 1));
   }
 
-  Json tree;
+  Json tree_;
 };
 
 TEST_F(LteSampleDecode, EverySectionHoldsDecodedValues) {
@@ -71,19 +71,19 @@ TEST_F(LteSampleDecode, EverySectionHoldsDecodedValues) {
   const std::vector<std::string> listSections = {"Measured Neighbor Cells", "Neighbor Cells List",
                                                  "Reselection Candidates List", "PDP Context Info"};
   for (const auto& name : rowSections) {
-    const Json* section = findNode(tree, name);
+    const Json* section = findNode(tree_, name);
     ASSERT_TRUE(section) << name;
     EXPECT_GE(rowsOf(*section).size(), 3u) << name;
   }
   for (const auto& name : listSections) {
-    const Json* section = findNode(tree, name);
+    const Json* section = findNode(tree_, name);
     ASSERT_TRUE(section) << name;
     ASSERT_TRUE(section->contains("children")) << name << " is empty";
     EXPECT_FALSE((*section)["children"].empty()) << name;
     for (const Json& row : (*section)["children"]) EXPECT_GE(rowsOf(row).size(), 2u) << name;
   }
   std::vector<std::pair<std::string, std::string>> values;
-  collectValues(tree, "", values);
+  collectValues(tree_, "", values);
   EXPECT_GT(values.size(), 100u);
   for (const auto& [path, value] : values) {
     EXPECT_NE(value, "-") << path << " kept the template's placeholder";
@@ -92,10 +92,10 @@ TEST_F(LteSampleDecode, EverySectionHoldsDecodedValues) {
 }
 
 TEST_F(LteSampleDecode, TheSectionsAgreeOnTheServingCell) {
-  const auto info = rowsOf(*findNode(tree, "Serving Cell Info"));
-  const auto measurements = rowsOf(*findNode(tree, "Serving Cell Measurements"));
-  const auto intraFrequency = rowsOf(*findNode(tree, "Connected mode LTE Intra-frequency Measurement"));
-  const auto reselection = rowsOf(*findNode(tree, "Reselection Candidates"));
+  const auto info = rowsOf(*findNode(tree_, "Serving Cell Info"));
+  const auto measurements = rowsOf(*findNode(tree_, "Serving Cell Measurements"));
+  const auto intraFrequency = rowsOf(*findNode(tree_, "Connected mode LTE Intra-frequency Measurement"));
+  const auto reselection = rowsOf(*findNode(tree_, "Reselection Candidates"));
   const std::string pci = info.at("Physical Cell ID");
   const std::string earfcn = info.at("Download Frequency");
   EXPECT_EQ(measurements.at("Physical Cell ID"), pci);
@@ -112,7 +112,7 @@ TEST_F(LteSampleDecode, TheSectionsAgreeOnTheServingCell) {
   EXPECT_EQ(measurements.at("Measured RSRP").substr(measurements.at("Measured RSRP").size() - 4), " dBm");
   // No neighbour row is the serving cell.
   for (const char* list : {"Measured Neighbor Cells", "Neighbor Cells List"}) {
-    for (const Json& row : (*findNode(tree, list))["children"]) EXPECT_NE(rowsOf(row).at("Physical Cell ID"), pci);
+    for (const Json& row : (*findNode(tree_, list))["children"]) EXPECT_NE(rowsOf(row).at("Physical Cell ID"), pci);
   }
 }
 

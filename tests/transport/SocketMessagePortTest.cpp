@@ -58,15 +58,15 @@ bool eventually(Condition condition, std::chrono::milliseconds limit = 2000ms) {
 
 class SocketMessagePortTest : public ::testing::Test {
  protected:
-  void SetUp() override { ASSERT_TRUE(runtime.result().ok()) << runtime.result().error; }
+  void SetUp() override { ASSERT_TRUE(runtime_.result().ok()) << runtime_.result().error; }
 
   // A local port on the server thread that records what arrives and answers
   // every message with "re:" and its data.
   std::shared_ptr<SocketLocalPort> serveEcho(const std::string& name) {
     std::shared_ptr<SocketLocalPort> port;
-    server.run([&](VirtualRunLoop& loop) {
-      port = ports.createSocketLocalPort(name, [this](LocalMessagePort&, MessageId id, const Bytes& data) {
-        received.add(id, data);
+    server_.run([&](VirtualRunLoop& loop) {
+      port = ports_.createSocketLocalPort(name, [this](LocalMessagePort&, MessageId id, const Bytes& data) {
+        received_.add(id, data);
         return std::optional<Bytes>(bytes("re:" + text(data)));
       });
       if (port) port->scheduleOn(loop);
@@ -75,40 +75,40 @@ class SocketMessagePortTest : public ::testing::Test {
   }
 
   void invalidateOnServer(const std::shared_ptr<SocketLocalPort>& port) {
-    server.run([&] { port->invalidate(); });
+    server_.run([&] { port->invalidate(); });
   }
 
-  test::RuntimeTestDirectory runtime;
-  SocketPortSystem ports{runtime.result().path};
-  Received received;
-  test::PortServerThread server;
+  test::RuntimeTestDirectory runtime_;
+  SocketPortSystem ports_{runtime_.result().path};
+  Received received_;
+  test::PortServerThread server_;
 };
 
 TEST_F(SocketMessagePortTest, RequestIsAnsweredOnTheSameConnection) {
   auto local = serveEcho("echo");
   ASSERT_TRUE(local);
-  auto remote = ports.createRemotePort("echo");
+  auto remote = ports_.createRemotePort("echo");
   ASSERT_TRUE(remote);
   std::optional<Bytes> reply;
   EXPECT_EQ(remote->sendRequest(7, bytes("hello"), 1.0, 1.0, &reply), kPortSuccess);
   ASSERT_TRUE(reply);
   EXPECT_EQ(text(*reply), "re:hello");
-  ASSERT_EQ(received.size(), 1u);
-  EXPECT_EQ(received.copy()[0].first, 7);
-  EXPECT_EQ(text(received.copy()[0].second), "hello");
+  ASSERT_EQ(received_.size(), 1u);
+  EXPECT_EQ(received_.copy()[0].first, 7);
+  EXPECT_EQ(text(received_.copy()[0].second), "hello");
   invalidateOnServer(local);
 }
 
 TEST_F(SocketMessagePortTest, MessageIdsAndDataArriveUnchangedAndInOrder) {
   auto local = serveEcho("ids");
-  auto remote = ports.createRemotePort("ids");
+  auto remote = ports_.createRemotePort("ids");
   ASSERT_TRUE(local && remote);
   const std::vector<MessageId> ids = {0, 1, -5, 123456, 0x7fffffff};
   for (MessageId id : ids) {
     EXPECT_EQ(remote->sendRequest(id, bytes("m" + std::to_string(id)), 1.0, 0.0, nullptr), kPortSuccess);
   }
-  ASSERT_TRUE(eventually([&] { return received.size() == ids.size(); }));
-  const auto messages = received.copy();
+  ASSERT_TRUE(eventually([&] { return received_.size() == ids.size(); }));
+  const auto messages = received_.copy();
   for (std::size_t i = 0; i < ids.size(); ++i) {
     EXPECT_EQ(messages[i].first, ids[i]);
     EXPECT_EQ(text(messages[i].second), "m" + std::to_string(ids[i]));
@@ -118,7 +118,7 @@ TEST_F(SocketMessagePortTest, MessageIdsAndDataArriveUnchangedAndInOrder) {
 
 TEST_F(SocketMessagePortTest, EmptyMessageAndMessagesLargerThanADatagramRoundTrip) {
   auto local = serveEcho("large");
-  auto remote = ports.createRemotePort("large");
+  auto remote = ports_.createRemotePort("large");
   ASSERT_TRUE(local && remote);
   std::optional<Bytes> reply;
   EXPECT_EQ(remote->sendRequest(0, {}, 1.0, 1.0, &reply), kPortSuccess);
@@ -135,13 +135,13 @@ TEST_F(SocketMessagePortTest, EmptyMessageAndMessagesLargerThanADatagramRoundTri
 
 TEST_F(SocketMessagePortTest, CallbackWithoutAnswerGivesSuccessAndNoReplyData) {
   std::shared_ptr<SocketLocalPort> local;
-  server.run([&](VirtualRunLoop& loop) {
-    local = ports.createSocketLocalPort("silent", [](LocalMessagePort&, MessageId, const Bytes&) {
+  server_.run([&](VirtualRunLoop& loop) {
+    local = ports_.createSocketLocalPort("silent", [](LocalMessagePort&, MessageId, const Bytes&) {
       return std::optional<Bytes>();
     });
     local->scheduleOn(loop);
   });
-  auto remote = ports.createRemotePort("silent");
+  auto remote = ports_.createRemotePort("silent");
   ASSERT_TRUE(remote);
   std::optional<Bytes> reply = bytes("stale");
   EXPECT_EQ(remote->sendRequest(0, bytes("x"), 1.0, 1.0, &reply), kPortSuccess);
@@ -150,29 +150,29 @@ TEST_F(SocketMessagePortTest, CallbackWithoutAnswerGivesSuccessAndNoReplyData) {
 }
 
 TEST_F(SocketMessagePortTest, RemotePortToAMissingNameCannotBeMade) {
-  EXPECT_EQ(ports.createRemotePort("nobody-here"), nullptr);
+  EXPECT_EQ(ports_.createRemotePort("nobody-here"), nullptr);
   std::string error;
-  EXPECT_EQ(ports.createSocketRemotePort("nobody-here", &error), nullptr);
+  EXPECT_EQ(ports_.createSocketRemotePort("nobody-here", &error), nullptr);
   EXPECT_NE(error.find("not reachable"), std::string::npos) << error;
 }
 
 TEST_F(SocketMessagePortTest, SendToAPortWhoseListenerHasGoneFails) {
   auto local = serveEcho("gone");
-  auto remote = ports.createRemotePort("gone");
+  auto remote = ports_.createRemotePort("gone");
   ASSERT_TRUE(local && remote);
   invalidateOnServer(local);
   std::optional<Bytes> reply;
   EXPECT_EQ(remote->sendRequest(0, bytes("anyone?"), 1.0, 1.0, &reply), kPortIsInvalid);
   EXPECT_FALSE(reply);
   EXPECT_EQ(remote->sendRequest(0, bytes("still?"), 1.0, 0.0, nullptr), kPortIsInvalid);
-  EXPECT_EQ(ports.createRemotePort("gone"), nullptr);
+  EXPECT_EQ(ports_.createRemotePort("gone"), nullptr);
 }
 
 TEST_F(SocketMessagePortTest, ReceiveTimeoutIsReportedAfterAboutTheTimeout) {
   // Never scheduled: the kernel takes the connection and the request, but
   // nobody reads them, so no reply can come.
-  auto local = ports.createSocketLocalPort("deaf", nullptr);
-  auto remote = ports.createRemotePort("deaf");
+  auto local = ports_.createSocketLocalPort("deaf", nullptr);
+  auto remote = ports_.createRemotePort("deaf");
   ASSERT_TRUE(local && remote);
   std::optional<Bytes> reply;
   const auto start = Clock::now();
@@ -185,8 +185,8 @@ TEST_F(SocketMessagePortTest, ReceiveTimeoutIsReportedAfterAboutTheTimeout) {
 }
 
 TEST_F(SocketMessagePortTest, SendTimeoutIsReportedWhenTheReceiverStopsReading) {
-  auto local = ports.createSocketLocalPort("full", nullptr);
-  auto remote = ports.createRemotePort("full");
+  auto local = ports_.createSocketLocalPort("full", nullptr);
+  auto remote = ports_.createRemotePort("full");
   ASSERT_TRUE(local && remote);
   const Bytes chunk(32 * 1024, 0x55);
   std::int32_t status = kPortSuccess;
@@ -196,14 +196,14 @@ TEST_F(SocketMessagePortTest, SendTimeoutIsReportedWhenTheReceiverStopsReading) 
 
 TEST_F(SocketMessagePortTest, LateReplyToATimedOutRequestIsNotTakenForTheNextReply) {
   std::shared_ptr<SocketLocalPort> local;
-  server.run([&](VirtualRunLoop& loop) {
-    local = ports.createSocketLocalPort("slow", [](LocalMessagePort&, MessageId, const Bytes& data) {
+  server_.run([&](VirtualRunLoop& loop) {
+    local = ports_.createSocketLocalPort("slow", [](LocalMessagePort&, MessageId, const Bytes& data) {
       if (text(data) == "slow") std::this_thread::sleep_for(300ms);
       return std::optional<Bytes>(bytes("answer to " + text(data)));
     });
     local->scheduleOn(loop);
   });
-  auto remote = ports.createRemotePort("slow");
+  auto remote = ports_.createRemotePort("slow");
   ASSERT_TRUE(remote);
   std::optional<Bytes> reply;
   EXPECT_EQ(remote->sendRequest(0, bytes("slow"), 1.0, 0.1, &reply), kPortReceiveTimeout);
@@ -215,7 +215,7 @@ TEST_F(SocketMessagePortTest, LateReplyToATimedOutRequestIsNotTakenForTheNextRep
 
 TEST_F(SocketMessagePortTest, RemotePortNoticesItsPeerHasGoneWithoutSendingAndRunsItsCallbackOnce) {
   auto local = serveEcho("peer");
-  auto remote = ports.createRemotePort("peer");
+  auto remote = ports_.createRemotePort("peer");
   ASSERT_TRUE(local && remote);
   int invalidations = 0;
   MessagePort* seen = nullptr;
@@ -240,7 +240,7 @@ TEST_F(SocketMessagePortTest, RemotePortNoticesAPeerProcessThatDied) {
   ASSERT_GE(child, 0);
   if (child == 0) {
     // The child serves the port and dies without any clean-up.
-    SocketPortSystem childPorts(runtime.result().path);
+    SocketPortSystem childPorts(runtime_.result().path);
     auto port = childPorts.createSocketLocalPort("process", nullptr);
     for (int i = 0; i < 200 && port; ++i) {
       port->acceptPending();
@@ -249,7 +249,7 @@ TEST_F(SocketMessagePortTest, RemotePortNoticesAPeerProcessThatDied) {
     ::_exit(0);
   }
   std::shared_ptr<RemoteMessagePort> remote;
-  ASSERT_TRUE(eventually([&] { return (remote = ports.createRemotePort("process")) != nullptr; }));
+  ASSERT_TRUE(eventually([&] { return (remote = ports_.createRemotePort("process")) != nullptr; }));
   int invalidations = 0;
   remote->setInvalidationCallback([&](MessagePort&) { ++invalidations; });
   EXPECT_TRUE(remote->isValid());
@@ -262,7 +262,7 @@ TEST_F(SocketMessagePortTest, RemotePortNoticesAPeerProcessThatDied) {
 
 TEST_F(SocketMessagePortTest, ClearedInvalidationCallbackIsNotRun) {
   auto local = serveEcho("cleared");
-  auto remote = ports.createRemotePort("cleared");
+  auto remote = ports_.createRemotePort("cleared");
   ASSERT_TRUE(local && remote);
   int invalidations = 0;
   remote->setInvalidationCallback([&](MessagePort&) { ++invalidations; });
@@ -274,9 +274,9 @@ TEST_F(SocketMessagePortTest, ClearedInvalidationCallbackIsNotRun) {
 }
 
 TEST_F(SocketMessagePortTest, InvalidatingALocalPortRunsItsCallbackOnceAndRemovesItsSocketFile) {
-  auto local = ports.createLocalPort("local", nullptr);
+  auto local = ports_.createLocalPort("local", nullptr);
   ASSERT_TRUE(local);
-  const auto file = ports.socketPath("local");
+  const auto file = ports_.socketPath("local");
   EXPECT_TRUE(std::filesystem::exists(file));
   int invalidations = 0;
   local->setInvalidationCallback([&](MessagePort&) { ++invalidations; });
@@ -287,7 +287,7 @@ TEST_F(SocketMessagePortTest, InvalidatingALocalPortRunsItsCallbackOnceAndRemove
   EXPECT_EQ(invalidations, 1);
   EXPECT_FALSE(std::filesystem::exists(file));
 
-  auto quiet = ports.createLocalPort("quiet", nullptr);
+  auto quiet = ports_.createLocalPort("quiet", nullptr);
   quiet->setInvalidationCallback([&](MessagePort&) { ++invalidations; });
   quiet->setInvalidationCallback(nullptr);
   quiet->invalidate();
@@ -295,25 +295,25 @@ TEST_F(SocketMessagePortTest, InvalidatingALocalPortRunsItsCallbackOnceAndRemove
 }
 
 TEST_F(SocketMessagePortTest, LocalPortNameServedByALiveSocketIsRefused) {
-  auto first = ports.createSocketLocalPort("unique", nullptr);
+  auto first = ports_.createSocketLocalPort("unique", nullptr);
   ASSERT_TRUE(first);
   std::string error;
-  EXPECT_EQ(ports.createSocketLocalPort("unique", nullptr, &error), nullptr);
-  EXPECT_EQ(error, "port \"unique\" is already served at " + ports.socketPath("unique").string());
+  EXPECT_EQ(ports_.createSocketLocalPort("unique", nullptr, &error), nullptr);
+  EXPECT_EQ(error, "port \"unique\" is already served at " + ports_.socketPath("unique").string());
   EXPECT_TRUE(first->isValid());
-  EXPECT_TRUE(std::filesystem::exists(ports.socketPath("unique")));
+  EXPECT_TRUE(std::filesystem::exists(ports_.socketPath("unique")));
 }
 
 TEST_F(SocketMessagePortTest, StaleSocketFileIsReplaced) {
   // A socket file left behind by a process that died: bound, never unlinked.
-  const std::string path = ports.socketPath("stale").string();
+  const std::string path = ports_.socketPath("stale").string();
   ASSERT_TRUE(test::leaveStaleSocket(path));
   ASSERT_TRUE(std::filesystem::exists(path));
-  EXPECT_EQ(ports.createRemotePort("stale"), nullptr);
+  EXPECT_EQ(ports_.createRemotePort("stale"), nullptr);
 
   auto local = serveEcho("stale");
   ASSERT_TRUE(local);
-  auto remote = ports.createRemotePort("stale");
+  auto remote = ports_.createRemotePort("stale");
   ASSERT_TRUE(remote);
   std::optional<Bytes> reply;
   EXPECT_EQ(remote->sendRequest(0, bytes("hi"), 1.0, 1.0, &reply), kPortSuccess);
@@ -328,13 +328,13 @@ TEST_F(SocketMessagePortTest, BadPortNamesAreRefused) {
   EXPECT_FALSE(SocketPortSystem::isValidPortName(std::string(81, 'x')));
   EXPECT_TRUE(SocketPortSystem::isValidPortName("CorvaneApp.{6f1c2a3b-0000-4000-8000-0123456789ab}"));
   EXPECT_TRUE(SocketPortSystem::isValidPortName("CorvaneApp.6f1c2a3b-0000-4000-8000-0123456789ab"));
-  EXPECT_EQ(ports.createLocalPort("../escape", nullptr), nullptr);
-  EXPECT_EQ(ports.createRemotePort("../escape"), nullptr);
+  EXPECT_EQ(ports_.createLocalPort("../escape", nullptr), nullptr);
+  EXPECT_EQ(ports_.createRemotePort("../escape"), nullptr);
 }
 
 TEST_F(SocketMessagePortTest, BatchedMessagesAllArriveInOrder) {
   auto local = serveEcho("batch");
-  auto remote = ports.createSocketRemotePort("batch");
+  auto remote = ports_.createSocketRemotePort("batch");
   ASSERT_TRUE(local && remote);
   std::vector<Bytes> payloads;
   for (int i = 0; i < 5000; ++i) payloads.push_back(bytes("packet " + std::to_string(i)));
@@ -349,8 +349,8 @@ TEST_F(SocketMessagePortTest, BatchedMessagesAllArriveInOrder) {
     if (sent < messages.size()) std::this_thread::sleep_for(1ms);
   }
   ASSERT_EQ(sent, messages.size());
-  ASSERT_TRUE(eventually([&] { return received.size() == messages.size(); }));
-  const auto all = received.copy();
+  ASSERT_TRUE(eventually([&] { return received_.size() == messages.size(); }));
+  const auto all = received_.copy();
   for (std::size_t i = 0; i < all.size(); ++i) ASSERT_EQ(text(all[i].second), "packet " + std::to_string(i));
   invalidateOnServer(local);
 }
@@ -358,25 +358,25 @@ TEST_F(SocketMessagePortTest, BatchedMessagesAllArriveInOrder) {
 TEST_F(SocketMessagePortTest, LocalPortReportsConnectionsOpeningAndClosing) {
   std::shared_ptr<SocketLocalPort> local;
   std::vector<std::size_t> counts;  // written on the server thread, read after run()
-  server.run([&](VirtualRunLoop& loop) {
-    local = ports.createSocketLocalPort("counted", nullptr);
+  server_.run([&](VirtualRunLoop& loop) {
+    local = ports_.createSocketLocalPort("counted", nullptr);
     local->setConnectionCallback([&](SocketLocalPort&, std::size_t open) { counts.push_back(open); });
     local->scheduleOn(loop);
   });
-  auto remote = ports.createRemotePort("counted");
+  auto remote = ports_.createRemotePort("counted");
   ASSERT_TRUE(remote);
   ASSERT_TRUE(eventually([&] {
     std::size_t open = 0;
-    server.run([&] { open = local->openConnections(); });
+    server_.run([&] { open = local->openConnections(); });
     return open == 1;
   }));
   remote->invalidate();
   ASSERT_TRUE(eventually([&] {
     std::size_t open = 1;
-    server.run([&] { open = local->openConnections(); });
+    server_.run([&] { open = local->openConnections(); });
     return open == 0;
   }));
-  server.run([&] { EXPECT_EQ(counts, (std::vector<std::size_t>{1, 0})); });
+  server_.run([&] { EXPECT_EQ(counts, (std::vector<std::size_t>{1, 0})); });
   invalidateOnServer(local);
 }
 

@@ -12,18 +12,18 @@ namespace {
 // A stand-in for the service's well-known port whose answer the test chooses.
 class SocketTelephonyClientTest : public ::testing::Test {
  protected:
-  void SetUp() override { ASSERT_TRUE(runtime.result().ok()) << runtime.result().error; }
+  void SetUp() override { ASSERT_TRUE(runtime_.result().ok()) << runtime_.result().error; }
   void TearDown() override {
-    if (service) server.run([&] { service->invalidate(); });
+    if (service_) server_.run([&] { service_->invalidate(); });
   }
 
   void serve(std::function<std::optional<Bytes>(MessageId, const Value&)> answer) {
-    server.run([&](VirtualRunLoop& loop) {
-      service = ports.createSocketLocalPort(std::string(kTelephonyServicePortName),
+    server_.run([&](VirtualRunLoop& loop) {
+      service_ = ports_.createSocketLocalPort(std::string(kTelephonyServicePortName),
                                             [answer](LocalMessagePort&, MessageId id, const Bytes& data) {
                                               return answer(id, plist::parse(data).value_or(Value()));
                                             });
-      service->scheduleOn(loop);
+      service_->scheduleOn(loop);
     });
   }
 
@@ -35,15 +35,15 @@ class SocketTelephonyClientTest : public ::testing::Test {
     return plist::serializeOrThrow(Value(fields), plist::Format::XML);
   }
 
-  test::RuntimeTestDirectory runtime;
-  SocketPortSystem ports{runtime.result().path};
-  SocketTelephonyClient client{ports};
-  std::shared_ptr<SocketLocalPort> service;
-  test::PortServerThread server;
+  test::RuntimeTestDirectory runtime_;
+  SocketPortSystem ports_{runtime_.result().path};
+  SocketTelephonyClient client_{ports_};
+  std::shared_ptr<SocketLocalPort> service_;
+  test::PortServerThread server_;
 };
 
 TEST_F(SocketTelephonyClientTest, UnreachableServiceGivesNoConnection) {
-  EXPECT_EQ(client.TelephonyServerConnectionCreate(nullptr), nullptr);
+  EXPECT_EQ(client_.TelephonyServerConnectionCreate(nullptr), nullptr);
 }
 
 TEST_F(SocketTelephonyClientTest, LogChannelRequestNamesTheLocalPortAndReturnsTheCommandPort) {
@@ -57,7 +57,7 @@ TEST_F(SocketTelephonyClientTest, LogChannelRequestNamesTheLocalPortAndReturnsTh
     }
     return std::optional<Bytes>(reply(0, 0, "corvane-telephonyd.channel.1"));
   });
-  auto connection = client.TelephonyServerConnectionCreate(nullptr);
+  auto connection = client_.TelephonyServerConnectionCreate(nullptr);
   ASSERT_TRUE(connection);
   std::string remote = "left over";
   const TelephonyError error = connection->NetworkMonitorCreateLogChannel("CorvaneApp.abc", remote);
@@ -71,7 +71,7 @@ TEST_F(SocketTelephonyClientTest, ServiceErrorIsPassedOnWithoutAName) {
   serve([&](MessageId, const Value&) {
     return std::optional<Bytes>(reply(kTelephonyDomainService, kTelephonyErrorBadPortName, "ignored"));
   });
-  auto connection = client.TelephonyServerConnectionCreate(nullptr);
+  auto connection = client_.TelephonyServerConnectionCreate(nullptr);
   ASSERT_TRUE(connection);
   std::string remote;
   const TelephonyError error = connection->NetworkMonitorCreateLogChannel("bad/name", remote);
@@ -82,7 +82,7 @@ TEST_F(SocketTelephonyClientTest, ServiceErrorIsPassedOnWithoutAName) {
 
 TEST_F(SocketTelephonyClientTest, ReplyThatIsNotAPropertyListIsAProtocolError) {
   serve([&](MessageId, const Value&) { return std::optional<Bytes>(Bytes{'n', 'o', 'p', 'e'}); });
-  auto connection = client.TelephonyServerConnectionCreate(nullptr);
+  auto connection = client_.TelephonyServerConnectionCreate(nullptr);
   ASSERT_TRUE(connection);
   std::string remote;
   const TelephonyError error = connection->NetworkMonitorCreateLogChannel("CorvaneApp.x", remote);
@@ -92,7 +92,7 @@ TEST_F(SocketTelephonyClientTest, ReplyThatIsNotAPropertyListIsAProtocolError) {
 
 TEST_F(SocketTelephonyClientTest, MissingReplyIsAProtocolError) {
   serve([&](MessageId, const Value&) { return std::optional<Bytes>(); });
-  auto connection = client.TelephonyServerConnectionCreate(nullptr);
+  auto connection = client_.TelephonyServerConnectionCreate(nullptr);
   ASSERT_TRUE(connection);
   std::string remote;
   const TelephonyError error = connection->NetworkMonitorCreateLogChannel("CorvaneApp.x", remote);
@@ -102,9 +102,9 @@ TEST_F(SocketTelephonyClientTest, MissingReplyIsAProtocolError) {
 
 TEST_F(SocketTelephonyClientTest, ServiceThatVanishedIsATransportError) {
   serve([&](MessageId, const Value&) { return std::optional<Bytes>(reply(0, 0, "x")); });
-  auto connection = client.TelephonyServerConnectionCreate(nullptr);
+  auto connection = client_.TelephonyServerConnectionCreate(nullptr);
   ASSERT_TRUE(connection);
-  server.run([&] { service->invalidate(); });
+  server_.run([&] { service_->invalidate(); });
   std::string remote;
   const TelephonyError error = connection->NetworkMonitorCreateLogChannel("CorvaneApp.x", remote);
   EXPECT_EQ(error.domain, kTelephonyDomainTransport);
