@@ -1,5 +1,6 @@
 #include "LogGenerator/gsm_umts/QND_GSMLogGenerator.h"
 #include "LogGenerator/lte/LTELogGenerator.h"
+#include "LogGenerator/utran/UTRANClassIndex.h"
 #include "LogGenerator/utran/UTRANLogGenerator.h"
 
 #include <gtest/gtest.h>
@@ -121,6 +122,24 @@ TEST(TechnologyGenerators, TheUtranTemplateIsTheFirstPlistWhoseNameSaysUtranInAn
   EXPECT_NE(std::find(texts.begin(), texts.end(), "Created UTRANLogGenerator object"), texts.end());
   // The UTRAN index prints nothing of its own.
   EXPECT_EQ(out, "Deallocing ClassIndex\n");
+}
+
+TEST(TechnologyGenerators, TheUtranIndexMakesTheSectionsOfItsTableAndPrintsNoTeardownLineOfItsOwn) {
+  log::ScopedCapture quiet;
+  testing::internal::CaptureStdout();
+  {
+    const UTRANClassIndex index;
+    ASSERT_EQ(index.sectionNames().size(), UTRANClassIndex::sections().size());
+    for (const SectionDescriptor& row : UTRANClassIndex::sections()) {
+      ASSERT_NE(index.getClass(row.name), nullptr) << row.name;
+      for (std::uint32_t code : row.codes) {
+        const auto* subscribers = index.getSubscribers(static_cast<std::int32_t>(code));
+        ASSERT_NE(subscribers, nullptr) << code;
+        EXPECT_EQ(subscribers->front().get(), index.getClass(row.name));
+      }
+    }
+  }
+  EXPECT_EQ(testing::internal::GetCapturedStdout(), "Deallocing ClassIndex\n");
 }
 
 TEST(TechnologyGenerators, WithoutAUtranTemplateTheGeneratorStaysEmpty) {
