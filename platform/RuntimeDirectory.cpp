@@ -57,6 +57,11 @@ RuntimeDirectoryResult prepareRuntimeDirectory(const std::filesystem::path& dire
   struct stat info {};
   if (::lstat(path.c_str(), &info) != 0)
     return failure(directory, std::string("cannot be examined: ") + std::strerror(errno));
+  if (S_ISLNK(info.st_mode)) {
+    return failure(directory,
+                   "is a symbolic link, which is not followed; remove the link so that the directory is made "
+                   "afresh, or set CORVANE_RUNTIME_DIR to a private directory");
+  }
   if (!S_ISDIR(info.st_mode)) return failure(directory, "is not a directory");
   if (info.st_uid != geteuid()) {
     return failure(directory, "is owned by uid " + std::to_string(info.st_uid) + ", not by this user (uid " +

@@ -5,6 +5,7 @@
 #include <unistd.h>
 
 #include <cstdlib>
+#include <filesystem>
 #include <fstream>
 
 #include "support/Process.h"
@@ -126,7 +127,24 @@ TEST(RuntimeDirectoryTest, SymbolicLinkToADirectoryIsRefused) {
   ASSERT_EQ(::symlink(target.c_str(), link.c_str()), 0);
   const auto result = prepareRuntimeDirectory(link);
   EXPECT_FALSE(result.ok());
-  EXPECT_EQ(result.error, "runtime directory " + link + " is not a directory");
+  EXPECT_EQ(result.error, "runtime directory " + link +
+                              " is a symbolic link, which is not followed; remove the link so that the directory "
+                              "is made afresh, or set CORVANE_RUNTIME_DIR to a private directory");
+  // Neither the link nor its target is touched.
+  EXPECT_EQ(std::filesystem::read_symlink(link), target);
+  EXPECT_EQ(modeOf(target), 0700u);
+}
+
+TEST(RuntimeDirectoryTest, DanglingSymbolicLinkIsRefusedAsALinkAndNothingIsMadeAtItsTarget) {
+  test::TemporaryDirectory temporary;
+  const std::string target = temporary.path() + "/elsewhere";
+  const std::string link = temporary.path() + "/run";
+  ASSERT_EQ(::symlink(target.c_str(), link.c_str()), 0);
+  const auto result = prepareRuntimeDirectory(link);
+  EXPECT_FALSE(result.ok());
+  EXPECT_EQ(result.error.rfind("runtime directory " + link + " is a symbolic link, which is not followed; ", 0), 0u)
+      << result.error;
+  EXPECT_FALSE(std::filesystem::exists(target));
 }
 
 TEST(RuntimeDirectoryTest, MissingParentIsReportedNotCreated) {
