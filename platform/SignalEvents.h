@@ -34,6 +34,11 @@ class SignalEvents {
   static std::unique_ptr<SignalEvents> watch(RunLoop& loop, const std::vector<int>& numbers, Handler onSignal,
                                              std::string& error);
 
+  // Readable from the moment a caught signal arrives until the run loop has
+  // handled it. Work that blocks the loop may poll it (never read it) to give
+  // up early: SocketPortSystem::interruptWaitsWhenReadable.
+  int pendingDescriptor() const { return readFd_; }
+
   // Gives the signals back to the actions they had before.
   ~SignalEvents();
   SignalEvents(const SignalEvents&) = delete;

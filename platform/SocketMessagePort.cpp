@@ -19,6 +19,29 @@
 
 namespace corvane {
 
+bool SocketPortShared::admitConnection() {
+  std::size_t open = connections_.load();
+  do {
+    if (open >= limits_.connections) return false;
+  } while (!connections_.compare_exchange_weak(open, open + 1));
+  refusingConnections_.store(false);
+  return true;
+}
+
+void SocketPortShared::releaseConnection() { connections_.fetch_sub(1); }
+
+bool SocketPortShared::holdUnfinished(std::size_t bytes) {
+  std::size_t held = unfinishedBytes_.load();
+  do {
+    if (bytes > limits_.unfinishedMessageBytes - std::min(held, limits_.unfinishedMessageBytes)) return false;
+  } while (!unfinishedBytes_.compare_exchange_weak(held, held + bytes));
+  return true;
+}
+
+void SocketPortShared::releaseUnfinished(std::size_t bytes) {
+  if (unfinishedBytes_.fetch_sub(bytes) == bytes) refusingUnfinished_.store(false);
+}
+
 namespace {
 
 using Clock = std::chrono::steady_clock;
@@ -34,6 +57,10 @@ constexpr int kDatagramsPerWakeup = 64;
 constexpr double kReplySendTimeout = 1.0;
 // Time a remote port keeps retrying a connection to a listener whose backlog is full.
 constexpr auto kConnectPatience = std::chrono::seconds(1);
+// Socket files are private to their owner whatever the umask; the directory is too.
+constexpr mode_t kSocketFileMode = 0600;
+// Pause between the two probes that find a socket file stale.
+constexpr auto kStaleSocketRecheck = std::chrono::milliseconds(50);
 
 struct FrameHeader {
   FrameKind kind = FrameKind::Message;
@@ -116,19 +143,38 @@ Clock::time_point deadlineAfter(double seconds) {
 
 bool isPeerGoneError(int error) { return error == EPIPE || error == ECONNRESET || error == ENOTCONN; }
 
+enum class WaitOutcome { Ready, TimedOut, Interrupted };
+
+// Waits until `fd` has the events or the deadline passes, unless the port
+// system's waits are interrupted first. With `fd` -1 it waits for the
+// deadline or the interruption alone.
+WaitOutcome waitUntil(int fd, short events, Clock::time_point deadline, const SocketPortShared& shared) {
+  for (;;) {
+    if (shared.waitsStopped()) return WaitOutcome::Interrupted;
+    if (Clock::now() >= deadline) return WaitOutcome::TimedOut;
+    pollfd p[2] = {{fd, events, 0}, {shared.interruptDescriptor(), POLLIN, 0}};
+    const int n = ::poll(p, 2, pollMilliseconds(deadline));
+    if (n < 0 && errno != EINTR) return WaitOutcome::TimedOut;
+    if (p[1].revents != 0) return WaitOutcome::Interrupted;  // a signal waits for the run loop
+    if (n > 0 && p[0].revents != 0) return WaitOutcome::Ready;
+  }
+}
+
 enum class SendOutcome { Sent, TimedOut, PeerGone, Failed };
 
 // Sends one datagram whole (SOCK_SEQPACKET sends are all or nothing), waiting
-// for buffer space until the deadline. Never raises SIGPIPE.
-SendOutcome sendDatagramUntil(int fd, std::span<const std::uint8_t> datagram, Clock::time_point deadline) {
+// for buffer space until the deadline or an interruption. Never raises SIGPIPE.
+SendOutcome sendDatagramUntil(int fd, std::span<const std::uint8_t> datagram, Clock::time_point deadline,
+                              const SocketPortShared& shared) {
+  bool waitOver = false;
   for (;;) {
     const ssize_t n = ::send(fd, datagram.data(), datagram.size(), MSG_DONTWAIT | MSG_NOSIGNAL);
     if (n >= 0) return SendOutcome::Sent;
     if (errno == EINTR) continue;
     if (errno == EAGAIN || errno == EWOULDBLOCK) {
-      if (Clock::now() >= deadline) return SendOutcome::TimedOut;
-      pollfd p{fd, POLLOUT, 0};
-      ::poll(&p, 1, pollMilliseconds(deadline));
+      if (waitOver) return SendOutcome::TimedOut;
+      // Once the wait is over, one last try: the space may have come with the end of the wait.
+      waitOver = waitUntil(fd, POLLOUT, deadline, shared) != WaitOutcome::Ready;
       continue;
     }
     if (isPeerGoneError(errno)) return SendOutcome::PeerGone;
@@ -136,8 +182,9 @@ SendOutcome sendDatagramUntil(int fd, std::span<const std::uint8_t> datagram, Cl
   }
 }
 
-// Receives one datagram without waiting. Returns its size, 0 at end of stream,
-// -1 when nothing is there, -2 on an error or a datagram bigger than the buffer.
+// Receives one datagram without waiting. Returns its size, 0 at end of stream
+// (or when the peer went leaving data of ours unread), -1 when nothing is
+// there, -2 on an error or a datagram bigger than the buffer.
 ssize_t receiveDatagram(int fd, std::vector<std::uint8_t>& buffer) {
   for (;;) {
     iovec io{buffer.data(), buffer.size()};
@@ -148,6 +195,7 @@ ssize_t receiveDatagram(int fd, std::vector<std::uint8_t>& buffer) {
     if (n >= 0) return (message.msg_flags & MSG_TRUNC) ? -2 : n;
     if (errno == EINTR) continue;
     if (errno == EAGAIN || errno == EWOULDBLOCK) return -1;
+    if (errno == ECONNRESET) return 0;
     return -2;
   }
 }
@@ -162,6 +210,31 @@ bool fillAddress(const std::filesystem::path& path, sockaddr_un& address) {
 }
 
 int newSocket() { return ::socket(AF_UNIX, SOCK_SEQPACKET | SOCK_NONBLOCK | SOCK_CLOEXEC, 0); }
+
+// Binds the socket to its file with mode 0600. Linux makes the file with the
+// socket's own mode less the umask, so the mode is set on the socket before
+// (the file never appears wider) and on the file after (a umask that takes
+// the owner's bits cannot leave it unusable).
+int bindPrivately(int fd, const sockaddr_un& address) {
+  if (::fchmod(fd, kSocketFileMode) != 0) return -1;
+  if (::bind(fd, reinterpret_cast<const sockaddr*>(&address), sizeof address) != 0) return -1;
+  if (::chmod(address.sun_path, kSocketFileMode) == 0) return 0;
+  const int saved = errno;
+  ::unlink(address.sun_path);
+  errno = saved;
+  return -1;
+}
+
+// Whether a listener is behind the socket file: a connection is taken, or
+// waits in a full backlog.
+bool somebodyListens(const sockaddr_un& address) {
+  const int probe = newSocket();
+  if (probe < 0) return false;
+  const bool live = ::connect(probe, reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0 ||
+                    errno == EAGAIN;
+  ::close(probe);
+  return live;
+}
 
 void setError(std::string* error, std::string text) {
   if (error) *error = std::move(text);
@@ -179,10 +252,14 @@ struct SocketLocalPort::Connection {
   bool assembling = false;
   FrameHeader pendingHeader;
   Bytes pending;
+  // What `pending` holds against the port system's limit: its capacity.
+  std::size_t held = 0;
 };
 
-SocketLocalPort::SocketLocalPort(std::string name, std::filesystem::path socketPath, int listener, Callback callback)
+SocketLocalPort::SocketLocalPort(std::string name, std::filesystem::path socketPath, int listener, Callback callback,
+                                 std::shared_ptr<SocketPortShared> shared)
     : name_(std::move(name)),
+      shared_(std::move(shared)),
       socketPath_(std::move(socketPath)),
       listener_(listener),
       callback_(std::move(callback)),
@@ -233,6 +310,16 @@ void SocketLocalPort::acceptPending() {
       }
       return;
     }
+    if (!shared_->admitConnection()) {
+      ::close(fd);
+      if (shared_->firstConnectionRefusal()) {
+        log::printf(log::kError,
+                    "Port %s refuses new connections: %zu are open, the most its process takes; "
+                    "refusing quietly until one closes",
+                    name_.c_str(), shared_->limits().connections);
+      }
+      continue;
+    }
     auto connection = std::make_shared<Connection>();
     connection->fd = fd;
     connections_.emplace(fd, connection);
@@ -280,20 +367,30 @@ bool SocketLocalPort::deliverDatagram(const std::shared_ptr<Connection>& connect
     const auto payload = frame->payload;
 
     Bytes data;
-    if (connection->assembling) {
+    if (connection->assembling || (header->flags & kMoreFollows)) {
+      if (!connection->assembling) {
+        connection->assembling = true;
+        connection->pendingHeader = *header;
+      }
       const FrameHeader& first = connection->pendingHeader;
       if (header->kind != first.kind || header->id != first.id || header->serial != first.serial) return false;
       if (connection->pending.size() + payload.size() > kSocketPortMaximumMessage) return false;
+      if (!reserveUnfinished(*connection, payload.size())) {
+        if (shared_->firstUnfinishedRefusal()) {
+          log::printf(log::kError,
+                      "Port %s dropped a connection: its unfinished message would take the memory held for "
+                      "unfinished messages past %zu bytes; dropping such connections quietly until none is held",
+                      name_.c_str(), shared_->limits().unfinishedMessageBytes);
+        }
+        closeConnection(connection);
+        return true;
+      }
       connection->pending.insert(connection->pending.end(), payload.begin(), payload.end());
       if (header->flags & kMoreFollows) continue;
       connection->assembling = false;
       data = std::move(connection->pending);
       connection->pending = {};
-    } else if (header->flags & kMoreFollows) {
-      connection->assembling = true;
-      connection->pendingHeader = *header;
-      connection->pending.assign(payload.begin(), payload.end());
-      continue;
+      releaseUnfinished(*connection);
     } else {
       data.assign(payload.begin(), payload.end());
     }
@@ -307,7 +404,7 @@ bool SocketLocalPort::deliverDatagram(const std::shared_ptr<Connection>& connect
       const FrameKind kind = reply ? FrameKind::Reply : FrameKind::EmptyReply;
       const auto deadline = deadlineAfter(kReplySendTimeout);
       for (const auto& out : messageDatagrams(kind, header->id, header->serial, reply ? *reply : Bytes{})) {
-        if (sendDatagramUntil(connection->fd, out, deadline) != SendOutcome::Sent) {
+        if (sendDatagramUntil(connection->fd, out, deadline, *shared_) != SendOutcome::Sent) {
           closeConnection(connection);
           return true;
         }
@@ -315,6 +412,29 @@ bool SocketLocalPort::deliverDatagram(const std::shared_ptr<Connection>& connect
     }
   }
   return true;
+}
+
+bool SocketLocalPort::reserveUnfinished(Connection& connection, std::size_t more) {
+  Bytes& pending = connection.pending;
+  const std::size_t needed = pending.size() + more;
+  if (needed <= connection.held) return true;
+  // Grow as a vector would, so that a long message is not copied once per
+  // datagram, but only as far as the limit allows.
+  const std::size_t doubled = std::min(2 * connection.held, kSocketPortMaximumMessage);
+  std::size_t capacity = std::max(needed, doubled);
+  if (!shared_->holdUnfinished(capacity - connection.held)) {
+    capacity = needed;
+    if (!shared_->holdUnfinished(capacity - connection.held)) return false;
+  }
+  pending.reserve(capacity);
+  connection.held = capacity;
+  return true;
+}
+
+void SocketLocalPort::releaseUnfinished(Connection& connection) {
+  if (connection.held == 0) return;
+  shared_->releaseUnfinished(connection.held);
+  connection.held = 0;
 }
 
 void SocketLocalPort::closeConnection(const std::shared_ptr<Connection>& connection) {
@@ -325,6 +445,9 @@ void SocketLocalPort::closeConnection(const std::shared_ptr<Connection>& connect
   connections_.erase(connection->fd);
   ::close(connection->fd);
   connection->fd = -1;
+  connection->pending = {};
+  releaseUnfinished(*connection);
+  shared_->releaseConnection();
   if (connectionCallback_) {
     auto self = shared_from_this();
     connectionCallback_(*this, connections_.size());
@@ -338,6 +461,9 @@ void SocketLocalPort::closeAll() {
     if (runLoop_ && connection->watch) runLoop_->cancel(connection->watch);
     ::close(connection->fd);
     connection->fd = -1;
+    connection->pending = {};
+    releaseUnfinished(*connection);
+    shared_->releaseConnection();
   }
   if (listener_ >= 0) {
     if (runLoop_ && listenerWatch_) runLoop_->cancel(listenerWatch_);
@@ -365,8 +491,8 @@ void SocketLocalPort::invalidate() {
 // ---------------------------------------------------------------------------
 // Remote port
 
-SocketRemotePort::SocketRemotePort(std::string name, int fd)
-    : name_(std::move(name)), fd_(fd), receiveBuffer_(kSocketPortMaximumDatagram) {}
+SocketRemotePort::SocketRemotePort(std::string name, int fd, std::shared_ptr<SocketPortShared> shared)
+    : name_(std::move(name)), shared_(std::move(shared)), fd_(fd), receiveBuffer_(kSocketPortMaximumDatagram) {}
 
 SocketRemotePort::~SocketRemotePort() {
   if (fd_ >= 0) ::close(fd_);
@@ -414,7 +540,7 @@ std::int32_t SocketRemotePort::sendRequest(MessageId id, std::span<const std::ui
   const std::uint32_t serial = reply ? serial_ : 0;
   const auto deadline = deadlineAfter(sendTimeout);
   for (const auto& datagram : messageDatagrams(reply ? FrameKind::Request : FrameKind::Message, id, serial, data)) {
-    switch (sendDatagramUntil(fd_, datagram, deadline)) {
+    switch (sendDatagramUntil(fd_, datagram, deadline, *shared_)) {
       case SendOutcome::Sent:
         break;
       case SendOutcome::TimedOut:
@@ -433,6 +559,7 @@ std::int32_t SocketRemotePort::sendRequest(MessageId id, std::span<const std::ui
 std::int32_t SocketRemotePort::awaitReply(std::uint32_t serial, double timeoutSeconds, std::optional<Bytes>* reply) {
   const auto deadline = deadlineAfter(timeoutSeconds);
   Bytes assembled;
+  bool waitOver = false;
   for (;;) {
     const ssize_t n = receiveDatagram(fd_, receiveBuffer_);
     if (n == 0) {
@@ -441,9 +568,9 @@ std::int32_t SocketRemotePort::awaitReply(std::uint32_t serial, double timeoutSe
     }
     if (n == -2) return kPortTransportError;
     if (n == -1) {
-      if (Clock::now() >= deadline) return kPortReceiveTimeout;
-      pollfd p{fd_, POLLIN, 0};
-      ::poll(&p, 1, pollMilliseconds(deadline));
+      if (waitOver) return kPortReceiveTimeout;
+      // Once the wait is over, one last look: the reply may have come with its end.
+      waitOver = waitUntil(fd_, POLLIN, deadline, *shared_) != WaitOutcome::Ready;
       continue;
     }
     const std::span<const std::uint8_t> datagram(receiveBuffer_.data(), static_cast<std::size_t>(n));
@@ -511,7 +638,8 @@ std::size_t SocketRemotePort::sendWithoutWaiting(std::span<const OutgoingMessage
 // ---------------------------------------------------------------------------
 // Port system
 
-SocketPortSystem::SocketPortSystem(std::filesystem::path runtimeDirectory) : directory_(std::move(runtimeDirectory)) {}
+SocketPortSystem::SocketPortSystem(std::filesystem::path runtimeDirectory, SocketPortLimits limits)
+    : directory_(std::move(runtimeDirectory)), shared_(std::make_shared<SocketPortShared>(limits)) {}
 
 std::filesystem::path SocketPortSystem::socketPath(const std::string& name) const {
   return directory_ / (name + ".sock");
@@ -521,6 +649,43 @@ bool SocketPortSystem::isValidPortName(std::string_view name) {
   if (name.empty() || name.size() > 80 || name.front() == '.') return false;
   // One file-name component of visible ASCII: no separators, blanks or control characters.
   return std::all_of(name.begin(), name.end(), [](char c) { return c > ' ' && c < 0x7f && c != '/'; });
+}
+
+std::vector<std::string> SocketPortSystem::removeStaleSocketFiles() {
+  struct Candidate {
+    std::filesystem::path path;
+    sockaddr_un address;
+    dev_t device;
+    ino_t inode;
+  };
+  // A socket file is judged by the file it is now: one replaced between the
+  // probes is somebody else's, new, and left alone.
+  const auto sameFile = [](const Candidate& candidate) {
+    struct stat info {};
+    return ::lstat(candidate.path.c_str(), &info) == 0 && S_ISSOCK(info.st_mode) &&
+           info.st_dev == candidate.device && info.st_ino == candidate.inode;
+  };
+  std::vector<Candidate> candidates;
+  std::error_code error;
+  for (std::filesystem::directory_iterator it(directory_, error), end; !error && it != end; it.increment(error)) {
+    Candidate candidate{it->path(), {}, 0, 0};
+    struct stat info {};
+    if (::lstat(candidate.path.c_str(), &info) != 0 || !S_ISSOCK(info.st_mode)) continue;
+    if (!fillAddress(candidate.path, candidate.address) || somebodyListens(candidate.address)) continue;
+    candidate.device = info.st_dev;
+    candidate.inode = info.st_ino;
+    candidates.push_back(std::move(candidate));
+  }
+  std::vector<std::string> removed;
+  if (candidates.empty()) return removed;
+  // A port being made binds its file a moment before it listens.
+  std::this_thread::sleep_for(kStaleSocketRecheck);
+  for (const Candidate& candidate : candidates) {
+    if (!sameFile(candidate) || somebodyListens(candidate.address) || !sameFile(candidate)) continue;
+    if (::unlink(candidate.path.c_str()) == 0) removed.push_back(candidate.path.filename().string());
+  }
+  std::sort(removed.begin(), removed.end());
+  return removed;
 }
 
 std::shared_ptr<LocalMessagePort> SocketPortSystem::createLocalPort(const std::string& name,
@@ -556,8 +721,7 @@ std::shared_ptr<SocketLocalPort> SocketPortSystem::createSocketLocalPort(const s
   sockaddr_un address{};
   const int fd = openSocketFor(name, path, address, error);
   if (fd < 0) return nullptr;
-  const auto* sa = reinterpret_cast<const sockaddr*>(&address);
-  if (::bind(fd, sa, sizeof address) != 0) {
+  if (bindPrivately(fd, address) != 0) {
     if (errno != EADDRINUSE) {
       const int saved = errno;
       ::close(fd);
@@ -566,10 +730,7 @@ std::shared_ptr<SocketLocalPort> SocketPortSystem::createSocketLocalPort(const s
     }
     // The file is there. A listener behind it means the name is taken; without
     // one it is left over from a process that died, and is replaced.
-    const int probe = newSocket();
-    const bool live = probe >= 0 && (::connect(probe, sa, sizeof address) == 0 || errno == EAGAIN);
-    if (probe >= 0) ::close(probe);
-    if (live) {
+    if (somebodyListens(address)) {
       ::close(fd);
       setError(error, "port \"" + name + "\" is already served at " + path.string());
       return nullptr;
@@ -581,7 +742,7 @@ std::shared_ptr<SocketLocalPort> SocketPortSystem::createSocketLocalPort(const s
       return nullptr;
     }
     ::unlink(path.c_str());
-    if (::bind(fd, sa, sizeof address) != 0) {
+    if (bindPrivately(fd, address) != 0) {
       const int saved = errno;
       ::close(fd);
       setError(error, "cannot bind " + path.string() + ": " + std::strerror(saved));
@@ -594,7 +755,7 @@ std::shared_ptr<SocketLocalPort> SocketPortSystem::createSocketLocalPort(const s
     setError(error, "cannot listen on " + path.string() + ": " + std::strerror(saved));
     return nullptr;
   }
-  return std::shared_ptr<SocketLocalPort>(new SocketLocalPort(name, path, fd, std::move(callback)));
+  return std::shared_ptr<SocketLocalPort>(new SocketLocalPort(name, path, fd, std::move(callback), shared_));
 }
 
 std::shared_ptr<SocketRemotePort> SocketPortSystem::createSocketRemotePort(const std::string& name,
@@ -606,17 +767,20 @@ std::shared_ptr<SocketRemotePort> SocketPortSystem::createSocketRemotePort(const
   const auto giveUp = Clock::now() + kConnectPatience;
   for (;;) {
     if (::connect(fd, reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0) break;
-    // A full backlog: the listener is alive but behind; give it a moment.
+    // A full backlog: the listener is alive but behind; give it a moment,
+    // unless the program is stopping.
     if ((errno == EAGAIN || errno == EINTR) && Clock::now() < giveUp) {
-      std::this_thread::sleep_for(std::chrono::milliseconds(1));
-      continue;
+      const int saved = errno;
+      const auto pause = std::min(giveUp, Clock::now() + std::chrono::milliseconds(1));
+      if (waitUntil(-1, 0, pause, *shared_) != WaitOutcome::Interrupted) continue;
+      errno = saved;
     }
     const int saved = errno;
     ::close(fd);
     setError(error, "port \"" + name + "\" is not reachable: " + std::strerror(saved));
     return nullptr;
   }
-  return std::shared_ptr<SocketRemotePort>(new SocketRemotePort(name, fd));
+  return std::shared_ptr<SocketRemotePort>(new SocketRemotePort(name, fd, shared_));
 }
 
 }  // namespace corvane

@@ -2,6 +2,7 @@
 
 #include <QCoreApplication>
 #include <gtest/gtest.h>
+#include <poll.h>
 #include <signal.h>
 #include <unistd.h>
 
@@ -88,6 +89,28 @@ TEST(SignalEventsTest, ASignalIsCaughtByOneWatcherAtATime) {
   ASSERT_TRUE(first) << error;
   EXPECT_FALSE(SignalEvents::watch(loop, {SIGUSR2}, [](int) {}, error));
   EXPECT_EQ(error, "cannot catch signal " + std::to_string(SIGUSR2) + ": it is caught already");
+}
+
+bool readable(int fd) {
+  pollfd p{fd, POLLIN, 0};
+  return ::poll(&p, 1, 0) == 1 && (p.revents & POLLIN) != 0;
+}
+
+TEST(SignalEventsTest, PendingDescriptorIsReadableFromTheSignalUntilTheLoopHasHandledIt) {
+  VirtualRunLoop loop;
+  std::vector<int> received;
+  std::string error;
+  const auto events = SignalEvents::watch(loop, {SIGUSR1}, [&](int signal) { received.push_back(signal); }, error);
+  ASSERT_TRUE(events) << error;
+  EXPECT_FALSE(readable(events->pendingDescriptor()));
+  ASSERT_EQ(::raise(SIGUSR1), 0);
+  EXPECT_TRUE(readable(events->pendingDescriptor()));
+  // Looking does not take the signal away from the loop.
+  EXPECT_TRUE(readable(events->pendingDescriptor()));
+  EXPECT_TRUE(received.empty());
+  loop.pollWatches();
+  EXPECT_EQ(received, std::vector<int>{SIGUSR1});
+  EXPECT_FALSE(readable(events->pendingDescriptor()));
 }
 
 }  // namespace

@@ -1,22 +1,27 @@
 #include "platform/SocketMessagePort.h"
 
 #include <gtest/gtest.h>
+#include <poll.h>
 #include <sys/socket.h>
 #include <sys/stat.h>
 #include <sys/un.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <chrono>
 #include <csignal>
 #include <cstring>
 #include <filesystem>
+#include <fstream>
 #include <mutex>
 #include <string>
 #include <thread>
 
 #include "PortServerThread.h"
 #include "RuntimeTestDirectory.h"
+#include "platform/Log.h"
+#include "platform/SignalEvents.h"
 
 namespace corvane {
 namespace {
@@ -378,6 +383,314 @@ TEST_F(SocketMessagePortTest, LocalPortReportsConnectionsOpeningAndClosing) {
   }));
   server_.run([&] { EXPECT_EQ(counts, (std::vector<std::size_t>{1, 0})); });
   invalidateOnServer(local);
+}
+
+// The raw protocol, as a peer that does not use the library writes it: a
+// 16-byte little-endian frame header (kind, flags, reserved, message id,
+// serial, payload length) and the payload.
+constexpr std::uint8_t kRequestFrame = 2;
+constexpr std::uint8_t kMoreFollows = 0x01;
+
+Bytes frame(std::uint8_t kind, std::uint8_t flags, std::int32_t id, std::uint32_t serial, const Bytes& payload) {
+  Bytes out = {kind, flags, 0, 0};
+  for (std::uint32_t value : {static_cast<std::uint32_t>(id), serial, static_cast<std::uint32_t>(payload.size())}) {
+    for (int shift = 0; shift < 32; shift += 8) out.push_back(static_cast<std::uint8_t>(value >> shift));
+  }
+  out.insert(out.end(), payload.begin(), payload.end());
+  return out;
+}
+
+// A connection of a peer that writes raw datagrams.
+class RawPeer {
+ public:
+  explicit RawPeer(const std::filesystem::path& socket) : fd_(::socket(AF_UNIX, SOCK_SEQPACKET | SOCK_CLOEXEC, 0)) {
+    sockaddr_un address{};
+    address.sun_family = AF_UNIX;
+    std::strncpy(address.sun_path, socket.c_str(), sizeof address.sun_path - 1);
+    connected_ = ::connect(fd_, reinterpret_cast<sockaddr*>(&address), sizeof address) == 0;
+  }
+  ~RawPeer() { ::close(fd_); }
+  RawPeer(const RawPeer&) = delete;
+  RawPeer& operator=(const RawPeer&) = delete;
+
+  bool connected() const { return connected_; }
+  bool send(const Bytes& datagram) { return ::send(fd_, datagram.data(), datagram.size(), MSG_NOSIGNAL) >= 0; }
+  // Whether the port has closed this connection (end of stream), waiting up to the limit.
+  bool closedByThePort(std::chrono::milliseconds limit = 2000ms) {
+    const auto giveUp = Clock::now() + limit;
+    for (;;) {
+      std::uint8_t buffer[kSocketPortMaximumDatagram];
+      const ssize_t n = ::recv(fd_, buffer, sizeof buffer, MSG_DONTWAIT);
+      if (n == 0 || (n < 0 && errno != EAGAIN && errno != EWOULDBLOCK)) return true;
+      if (Clock::now() > giveUp) return false;
+      if (n < 0) std::this_thread::sleep_for(1ms);
+    }
+  }
+  // The payload of the next reply, waiting up to a second.
+  std::optional<Bytes> reply() {
+    pollfd p{fd_, POLLIN, 0};
+    if (::poll(&p, 1, 1000) != 1) return std::nullopt;
+    Bytes buffer(kSocketPortMaximumDatagram);
+    const ssize_t n = ::recv(fd_, buffer.data(), buffer.size(), MSG_DONTWAIT);
+    if (n < 16) return std::nullopt;
+    return Bytes(buffer.begin() + 16, buffer.begin() + n);
+  }
+
+ private:
+  int fd_;
+  bool connected_ = false;
+};
+
+std::size_t linesContaining(const log::CapturingSink& sink, std::string_view part) {
+  const auto texts = sink.texts();
+  return static_cast<std::size_t>(
+      std::count_if(texts.begin(), texts.end(), [&](const std::string& t) { return t.find(part) != t.npos; }));
+}
+
+mode_t socketFileMode(const std::filesystem::path& path) {
+  struct stat info {};
+  EXPECT_EQ(::lstat(path.c_str(), &info), 0);
+  EXPECT_TRUE(S_ISSOCK(info.st_mode));
+  return info.st_mode & 07777;
+}
+
+TEST_F(SocketMessagePortTest, SocketFilesAreMadeWithMode0600WhateverTheUmask) {
+  for (const mode_t mask : {mode_t{0}, mode_t{022}, mode_t{0277}}) {
+    const mode_t previous = ::umask(mask);
+    const std::string name = "private-" + std::to_string(mask);
+    auto port = ports_.createLocalPort(name, nullptr);
+    // A stale file of the same name is replaced by one of the same mode.
+    ASSERT_TRUE(test::leaveStaleSocket(ports_.socketPath(name + "-replaced").string()));
+    auto replacing = ports_.createLocalPort(name + "-replaced", nullptr);
+    ::umask(previous);
+    ASSERT_TRUE(port && replacing);
+    EXPECT_EQ(socketFileMode(ports_.socketPath(name)), 0600u) << "umask " << mask;
+    EXPECT_EQ(socketFileMode(ports_.socketPath(name + "-replaced")), 0600u) << "umask " << mask;
+    // And the port can be reached.
+    EXPECT_TRUE(ports_.createRemotePort(name));
+  }
+}
+
+TEST_F(SocketMessagePortTest, StaleSocketFilesAreRemovedAndLiveOnesOtherFilesAndLinksAreLeftAlone) {
+  const auto directory = std::filesystem::path(runtime_.path());
+  ASSERT_TRUE(test::leaveStaleSocket((directory / "corvane-telephonyd.channel.dead.sock").string()));
+  ASSERT_TRUE(test::leaveStaleSocket((directory / "CorvaneApp.dead.sock").string()));
+  auto live = ports_.createLocalPort("corvane-telephonyd.channel.live", nullptr);
+  ASSERT_TRUE(live);
+  std::ofstream(directory / "notes.sock") << "not a socket";
+  test::TemporaryDirectory elsewhere;
+  const std::string outside = elsewhere.path() + "/outside.sock";
+  ASSERT_TRUE(test::leaveStaleSocket(outside));
+  std::filesystem::create_symlink(outside, directory / "link.sock");
+
+  EXPECT_EQ(ports_.removeStaleSocketFiles(),
+            (std::vector<std::string>{"CorvaneApp.dead.sock", "corvane-telephonyd.channel.dead.sock"}));
+  std::vector<std::string> left;
+  for (const auto& entry : std::filesystem::directory_iterator(directory)) {
+    left.push_back(entry.path().filename().string());
+  }
+  std::sort(left.begin(), left.end());
+  EXPECT_EQ(left, (std::vector<std::string>{"corvane-telephonyd.channel.live.sock", "link.sock", "notes.sock"}));
+  EXPECT_TRUE(std::filesystem::exists(outside));
+  EXPECT_TRUE(ports_.createRemotePort("corvane-telephonyd.channel.live"));
+  EXPECT_TRUE(ports_.removeStaleSocketFiles().empty());
+}
+
+TEST_F(SocketMessagePortTest, ConnectionsBeyondTheLimitAreRefusedWithOneLineAndTheOthersAreServed) {
+  log::ScopedCapture capture;
+  SocketPortSystem limited(runtime_.result().path, {.connections = 2});
+  std::shared_ptr<SocketLocalPort> local;
+  server_.run([&](VirtualRunLoop& loop) {
+    local = limited.createSocketLocalPort("limited", [](LocalMessagePort&, MessageId, const Bytes& data) {
+      return std::optional<Bytes>(bytes("re:" + text(data)));
+    });
+    local->scheduleOn(loop);
+  });
+  auto first = ports_.createRemotePort("limited");
+  auto second = ports_.createRemotePort("limited");
+  ASSERT_TRUE(first && second);
+  std::optional<Bytes> reply;
+  ASSERT_EQ(first->sendRequest(0, bytes("1"), 1.0, 1.0, &reply), kPortSuccess);
+  ASSERT_EQ(second->sendRequest(0, bytes("2"), 1.0, 1.0, &reply), kPortSuccess);
+  for (int i = 0; i < 3; ++i) {
+    // The kernel takes the connection; the port closes it unread.
+    auto refused = ports_.createRemotePort("limited");
+    ASSERT_TRUE(refused);
+    EXPECT_EQ(refused->sendRequest(0, bytes("3"), 1.0, 1.0, &reply), kPortIsInvalid);
+  }
+  EXPECT_EQ(limited.shared().openConnections(), 2u);
+  EXPECT_EQ(capture.sink().count("Port limited refuses new connections: 2 are open, the most its process takes; "
+                                 "refusing quietly until one closes"),
+            1u);
+  ASSERT_EQ(first->sendRequest(0, bytes("still"), 1.0, 1.0, &reply), kPortSuccess);
+  EXPECT_EQ(text(*reply), "re:still");
+
+  // When one closes there is room again.
+  first->invalidate();
+  ASSERT_TRUE(eventually([&] { return limited.shared().openConnections() == 1; }));
+  auto next = ports_.createRemotePort("limited");
+  ASSERT_TRUE(next);
+  ASSERT_EQ(next->sendRequest(0, bytes("next"), 1.0, 1.0, &reply), kPortSuccess);
+  EXPECT_EQ(text(*reply), "re:next");
+  invalidateOnServer(local);
+  EXPECT_EQ(limited.shared().openConnections(), 0u);
+}
+
+TEST_F(SocketMessagePortTest, UnfinishedMessagesBeyondTheLimitDropTheirConnectionsWithOneLineAndTheOthersAreServed) {
+  log::ScopedCapture capture;
+  constexpr std::size_t kLimit = 256 * 1024;
+  SocketPortSystem limited(runtime_.result().path, {.connections = 16, .unfinishedMessageBytes = kLimit});
+  std::shared_ptr<SocketLocalPort> local;
+  server_.run([&](VirtualRunLoop& loop) {
+    local = limited.createSocketLocalPort("assembling", [](LocalMessagePort&, MessageId, const Bytes& data) {
+      return std::optional<Bytes>(bytes("got " + std::to_string(data.size())));
+    });
+    local->scheduleOn(loop);
+  });
+  const Bytes part(40 * 1024, 0x41);
+  const std::string refusal = "Port assembling dropped a connection: its unfinished message would take the memory "
+                              "held for unfinished messages past 262144 bytes; dropping such connections quietly "
+                              "until none is held";
+  // Eight peers start a message of three parts of 40 KB and stop there.
+  std::vector<std::unique_ptr<RawPeer>> peers;
+  for (std::uint32_t serial = 1; serial <= 8; ++serial) {
+    auto peer = std::make_unique<RawPeer>(limited.socketPath("assembling"));
+    ASSERT_TRUE(peer->connected());
+    for (int i = 0; i < 3; ++i) peer->send(frame(kRequestFrame, kMoreFollows, 9, serial, part));
+    peers.push_back(std::move(peer));
+  }
+  ASSERT_TRUE(eventually([&] { return linesContaining(capture.sink(), "unfinished message") == 1; }));
+  std::vector<RawPeer*> dropped;
+  std::vector<std::pair<RawPeer*, std::uint32_t>> kept;
+  for (std::uint32_t serial = 1; serial <= 8; ++serial) {
+    RawPeer* peer = peers[serial - 1].get();
+    if (peer->closedByThePort(100ms)) {
+      dropped.push_back(peer);
+    } else {
+      kept.emplace_back(peer, serial);
+    }
+  }
+  EXPECT_LE(limited.shared().unfinishedMessageBytes(), kLimit);
+  EXPECT_GE(kept.size(), 1u);
+  EXPECT_GE(dropped.size(), 5u);
+  EXPECT_EQ(capture.sink().count(refusal), 1u);
+  // The peers kept are served: their messages finish and are answered.
+  for (auto [peer, serial] : kept) {
+    ASSERT_TRUE(peer->send(frame(kRequestFrame, 0, 9, serial, bytes("end"))));
+    EXPECT_EQ(peer->reply(), bytes("got " + std::to_string(3 * part.size() + 3)));
+  }
+  ASSERT_TRUE(eventually([&] { return limited.shared().unfinishedMessageBytes() == 0; }));
+
+  // With nothing held, the next wave of refusals is reported again, once.
+  std::vector<std::unique_ptr<RawPeer>> wave;
+  for (std::uint32_t serial = 1; serial <= 8; ++serial) {
+    wave.push_back(std::make_unique<RawPeer>(limited.socketPath("assembling")));
+    for (int i = 0; i < 3; ++i) wave.back()->send(frame(kRequestFrame, kMoreFollows, 9, serial, part));
+  }
+  ASSERT_TRUE(eventually([&] { return capture.sink().count(refusal) == 2; }));
+  wave.clear();
+  peers.clear();
+  ASSERT_TRUE(eventually([&] { return limited.shared().openConnections() == 0; }));
+  EXPECT_EQ(limited.shared().unfinishedMessageBytes(), 0u);
+  EXPECT_EQ(capture.sink().count(refusal), 2u);
+  invalidateOnServer(local);
+}
+
+TEST_F(SocketMessagePortTest, AWaitForAReplyEndsWhenTheInterruptDescriptorBecomesReadable) {
+  int signalled[2];
+  ASSERT_EQ(::pipe(signalled), 0);
+  ports_.interruptWaitsWhenReadable(signalled[0]);
+  auto local = ports_.createSocketLocalPort("never-answers", nullptr);  // never scheduled: nobody reads
+  auto remote = ports_.createRemotePort("never-answers");
+  ASSERT_TRUE(local && remote);
+  std::thread signaller([&] {
+    std::this_thread::sleep_for(100ms);
+    const char byte = 1;
+    EXPECT_EQ(::write(signalled[1], &byte, 1), 1);
+  });
+  std::optional<Bytes> reply;
+  const auto start = Clock::now();
+  EXPECT_EQ(remote->sendRequest(0, bytes("hello"), 5.0, 5.0, &reply), kPortReceiveTimeout);
+  const auto waited = Clock::now() - start;
+  signaller.join();
+  EXPECT_GE(waited, 90ms);
+  EXPECT_LT(waited, 1s);
+  // While it stays readable, no wait starts at all.
+  const auto again = Clock::now();
+  EXPECT_EQ(remote->sendRequest(0, bytes("hello"), 5.0, 5.0, &reply), kPortReceiveTimeout);
+  EXPECT_LT(Clock::now() - again, 100ms);
+  ports_.interruptWaitsWhenReadable(-1);
+  ::close(signalled[0]);
+  ::close(signalled[1]);
+}
+
+TEST_F(SocketMessagePortTest, ATerminationSignalEndsAWaitForBufferSpace) {
+  VirtualRunLoop loop;
+  std::vector<int> received;
+  std::string error;
+  const auto events = SignalEvents::watch(loop, {SIGUSR2}, [&](int signal) { received.push_back(signal); }, error);
+  ASSERT_TRUE(events) << error;
+  ports_.interruptWaitsWhenReadable(events->pendingDescriptor());
+  auto local = ports_.createSocketLocalPort("stops-reading", nullptr);
+  auto remote = ports_.createRemotePort("stops-reading");
+  ASSERT_TRUE(local && remote);
+  const Bytes chunk(32 * 1024, 0x55);
+  while (remote->sendRequest(0, chunk, 0.0, 0.0, nullptr) == kPortSuccess) {
+  }
+  std::thread signaller([] {
+    std::this_thread::sleep_for(100ms);
+    ::kill(::getpid(), SIGUSR2);
+  });
+  const auto start = Clock::now();
+  EXPECT_EQ(remote->sendRequest(0, chunk, 5.0, 0.0, nullptr), kPortSendTimeout);
+  const auto waited = Clock::now() - start;
+  signaller.join();
+  EXPECT_GE(waited, 90ms);
+  EXPECT_LT(waited, 1s);
+  // The signal is still the loop's to handle.
+  loop.pollWatches();
+  EXPECT_EQ(received, std::vector<int>{SIGUSR2});
+  ports_.interruptWaitsWhenReadable(-1);
+}
+
+TEST_F(SocketMessagePortTest, AfterStopWaitingNothingWaitsButWhatTheSocketTakesAtOnceStillGoes) {
+  std::vector<std::string> arrived;
+  auto local = ports_.createSocketLocalPort("stopping", [&](LocalMessagePort&, MessageId, const Bytes& data) {
+    arrived.push_back(text(data));
+    return std::optional<Bytes>(bytes("too late"));
+  });
+  auto remote = ports_.createRemotePort("stopping");
+  ASSERT_TRUE(local && remote);
+  ports_.stopWaiting();
+  // The request goes at once; its reply, which nobody is there to make yet, is not waited for.
+  std::optional<Bytes> reply;
+  auto start = Clock::now();
+  EXPECT_EQ(remote->sendRequest(1, bytes("last words"), 1.0, 1.0, &reply), kPortReceiveTimeout);
+  EXPECT_LT(Clock::now() - start, 100ms);
+  VirtualRunLoop loop;
+  local->scheduleOn(loop);
+  ASSERT_TRUE(eventually([&] {
+    loop.pollWatches();
+    return !arrived.empty();
+  }));
+  EXPECT_EQ(arrived, std::vector<std::string>{"last words"});
+
+  // Nor does a new connection wait for a listener that is behind on its backlog.
+  const int listener = ::socket(AF_UNIX, SOCK_SEQPACKET | SOCK_CLOEXEC, 0);
+  sockaddr_un address{};
+  address.sun_family = AF_UNIX;
+  std::strncpy(address.sun_path, ports_.socketPath("behind").c_str(), sizeof address.sun_path - 1);
+  ASSERT_EQ(::bind(listener, reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
+  ASSERT_EQ(::listen(listener, 0), 0);
+  RawPeer waiting(ports_.socketPath("behind"));  // fills the backlog of one
+  ASSERT_TRUE(waiting.connected());
+  start = Clock::now();
+  std::string error;
+  EXPECT_EQ(ports_.createSocketRemotePort("behind", &error), nullptr);
+  EXPECT_LT(Clock::now() - start, 100ms);
+  EXPECT_EQ(error, "port \"behind\" is not reachable: " + std::string(std::strerror(EAGAIN)));
+  ::close(listener);
+  local->invalidate();
 }
 
 }  // namespace
