@@ -54,6 +54,12 @@ TelephonyService::~TelephonyService() {
 }
 
 bool TelephonyService::start(std::string& error) {
+  // A process that was killed leaves its socket files behind (a service its
+  // channels', a client its own port); nothing else would ever remove them.
+  if (const auto stale = ports_.removeStaleSocketFiles(); !stale.empty()) {
+    log::printf(log::kNotice, "Removed %zu socket files that nobody listened on, left by processes that were killed",
+                stale.size());
+  }
   servicePort_ = ports_.createSocketLocalPort(
       std::string(kTelephonyServicePortName),
       [this](LocalMessagePort&, MessageId id, const Bytes& data) { return handleServiceRequest(id, data); }, &error);

@@ -34,8 +34,9 @@ class TelephonyService {
   TelephonyService(const TelephonyService&) = delete;
   TelephonyService& operator=(const TelephonyService&) = delete;
 
-  // Opens the well-known port; false with a one-line reason when that fails
-  // (for instance because another service is serving it).
+  // Removes the socket files in the runtime directory that nobody listens on,
+  // then opens the well-known port; false with a one-line reason when that
+  // fails (for instance because another service is serving it).
   bool start(std::string& error);
   // Ends every channel and closes the well-known port, removing the socket files.
   void stop();

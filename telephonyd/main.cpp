@@ -78,17 +78,21 @@ int main(int argc, char** argv) {
   int qtArgc = 1;
   QCoreApplication application(qtArgc, argv);
   QtRunLoop runLoop;
+  SocketPortSystem ports(runtime.path);
   // The termination signals are caught before the service opens its sockets:
   // they end the loop, and shutdown runs as ordinary work that removes them.
+  // A signal also ends at once whatever wait a silent or slow peer holds the
+  // loop in, and from then on the ports wait for nothing.
   const std::unique_ptr<SignalEvents> signalEvents = SignalEvents::watch(
       runLoop, SignalEvents::terminationSignals(),
-      [](int signal) {
+      [&ports](int signal) {
         log::printf(log::kNotice, "corvane-telephonyd stopping on signal %d", signal);
+        ports.stopWaiting();
         QCoreApplication::quit();
       },
       error);
   if (!signalEvents) return fail(error);
-  SocketPortSystem ports(runtime.path);
+  ports.interruptWaitsWhenReadable(signalEvents->pendingDescriptor());
   TelephonyService service(ports, runLoop, std::move(source), {options.rate, options.packetLimit});
   if (!service.start(error)) {
     const std::string path = ports.socketPath(std::string(kTelephonyServicePortName)).string();

@@ -1,18 +1,23 @@
 // corvane-telephonyd as a process, talked to through the real client library
 // in a runtime directory of the test's own.
 
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <signal.h>
 #include <spawn.h>
 #include <sys/socket.h>
+#include <sys/stat.h>
 #include <sys/un.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <chrono>
 #include <cstring>
 #include <filesystem>
+#include <fstream>
 #include <set>
+#include <sstream>
 #include <thread>
 
 #include "LogGenerator/GSM/GSMLogGenerator.h"
@@ -25,6 +30,7 @@
 #include "platform/VirtualRunLoop.h"
 #include "support/LogRecords.h"
 #include "support/Process.h"
+#include "transport/RawPeer.h"
 #include "transport/RuntimeTestDirectory.h"
 
 extern char** environ;
@@ -55,13 +61,20 @@ std::vector<std::string> serviceSockets(const std::string& directory) {
 
 class Daemon {
  public:
-  Daemon(const SocketPortSystem& ports, std::vector<std::string> arguments) {
+  // With `errorFile`, the daemon's standard error goes there.
+  Daemon(const SocketPortSystem& ports, std::vector<std::string> arguments, const std::string& errorFile = "") {
     arguments.insert(arguments.begin(), kDaemon);
     std::vector<char*> argv;
     for (auto& a : arguments) argv.push_back(a.data());
     argv.push_back(nullptr);
+    posix_spawn_file_actions_t actions;
+    posix_spawn_file_actions_init(&actions);
+    if (!errorFile.empty()) {
+      posix_spawn_file_actions_addopen(&actions, STDERR_FILENO, errorFile.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0600);
+    }
     // The environment carries the test's CORVANE_RUNTIME_DIR.
-    if (::posix_spawn(&pid_, kDaemon.c_str(), nullptr, nullptr, argv.data(), environ) != 0) pid_ = -1;
+    if (::posix_spawn(&pid_, kDaemon.c_str(), &actions, nullptr, argv.data(), environ) != 0) pid_ = -1;
+    posix_spawn_file_actions_destroy(&actions);
     const auto giveUp = Clock::now() + 5s;
     SocketPortSystem probe(ports.directory());
     while (pid_ > 0 && Clock::now() < giveUp && !probe.createRemotePort(std::string(kTelephonyServicePortName))) {
@@ -87,6 +100,8 @@ class Daemon {
     }
     return true;
   }
+
+  pid_t pid() const { return pid_; }
 
   // Sends the signal and returns the exit status, or -1 when it does not end within 3 s.
   int stop(int signal) {
@@ -472,6 +487,185 @@ TEST_F(DaemonTest, StaleSocketFileIsReplaced) {
   EXPECT_EQ(client.technology(), "IFX");
 }
 
+std::vector<std::string> filesIn(const std::string& directory) {
+  std::vector<std::string> names;
+  for (const auto& entry : std::filesystem::directory_iterator(directory)) {
+    names.push_back(entry.path().filename().string());
+  }
+  std::sort(names.begin(), names.end());
+  return names;
+}
+
+TEST_F(DaemonTest, SocketFilesLeftByAKilledServiceAreRemovedAtTheNextStartAndLiveOnesAreLeftAlone) {
+  {
+    Daemon killed(ports_, {});
+    Client client(ports_, loop_);
+    ASSERT_TRUE(client.connected());
+    EXPECT_EQ(killed.stop(SIGKILL), 128 + SIGKILL);
+  }
+  // The well-known socket and the channel's stay behind.
+  ASSERT_EQ(serviceSockets(runtime_.path()).size(), 2u);
+  ASSERT_TRUE(test::leaveStaleSocket(runtime_.path() + "/CorvaneApp.killed.sock"));
+  // A channel of another instance that still runs, and a file that is no socket.
+  auto live = ports_.createLocalPort("corvane-telephonyd.channel.another-instance", nullptr);
+  ASSERT_TRUE(live);
+  std::ofstream(runtime_.path() + "/notes.sock") << "not a socket";
+
+  Daemon restarted(ports_, {});
+  ASSERT_TRUE(restarted.running());
+  EXPECT_EQ(filesIn(runtime_.path()), (std::vector<std::string>{"corvane-telephonyd.channel.another-instance.sock",
+                                                                 "corvane-telephonyd.sock", "notes.sock"}));
+  Client client(ports_, loop_);
+  ASSERT_TRUE(client.connected());
+  EXPECT_EQ(client.technology(), "IFX");
+}
+
+mode_t modeOf(const std::string& path) {
+  struct stat info {};
+  EXPECT_EQ(::lstat(path.c_str(), &info), 0) << path;
+  return info.st_mode & 07777;
+}
+
+TEST_F(DaemonTest, SocketFilesAreOnlyTheOwnersWhateverTheUmask) {
+  for (const mode_t mask : {mode_t{0}, mode_t{022}}) {
+    const mode_t previous = ::umask(mask);
+    Daemon daemon(ports_, {});
+    ::umask(previous);
+    Client client(ports_, loop_);
+    ASSERT_TRUE(client.connected());
+    const auto sockets = serviceSockets(runtime_.path());
+    ASSERT_EQ(sockets.size(), 2u);
+    for (const auto& name : sockets) EXPECT_EQ(modeOf(runtime_.path() + "/" + name), 0600u) << name << " " << mask;
+    EXPECT_EQ(daemon.stop(SIGTERM), 0);
+  }
+}
+
+// The resident memory of a process, in bytes.
+std::size_t residentBytes(pid_t pid) {
+  std::ifstream status("/proc/" + std::to_string(pid) + "/status");
+  std::string line;
+  while (std::getline(status, line)) {
+    if (line.rfind("VmRSS:", 0) == 0) return std::stoull(line.substr(6)) * 1024;
+  }
+  return 0;
+}
+
+std::string contentsOf(const std::string& path) {
+  std::ifstream in(path);
+  std::stringstream text;
+  text << in.rdbuf();
+  return text.str();
+}
+
+std::size_t occurrences(const std::string& text, const std::string& part) {
+  std::size_t count = 0;
+  for (auto at = text.find(part); at != std::string::npos; at = text.find(part, at + part.size())) ++count;
+  return count;
+}
+
+// Whether this build (and so the daemon beside it) runs under AddressSanitizer.
+#if defined(__SANITIZE_ADDRESS__)
+constexpr bool kSanitized = true;
+#else
+constexpr bool kSanitized = false;
+#endif
+
+TEST_F(DaemonTest, UnfinishedMessagesOfManyConnectionsAreCappedWithOneLineAndTheServiceServesOn) {
+  test::TemporaryDirectory logs;
+  const std::string errors = logs.path() + "/stderr";
+  Daemon daemon(ports_, {"--log-stderr"}, errors);
+  ASSERT_TRUE(daemon.running());
+  const std::size_t before = residentBytes(daemon.pid());
+  // Twenty peers each start a request of 4 MB and never finish it: 80 MB if all were held.
+  const auto socket = ports_.socketPath(std::string(kTelephonyServicePortName));
+  const Bytes part(kSocketPortMaximumDatagram - test::kFrameHeaderSize, 0x5a);
+  std::vector<std::unique_ptr<test::RawPeer>> peers;
+  for (std::uint32_t serial = 1; serial <= 20; ++serial) {
+    auto peer = std::make_unique<test::RawPeer>(socket);
+    ASSERT_TRUE(peer->connected());
+    for (int i = 0; i < 64; ++i) {
+      if (!peer->send(test::frame(test::kRequestFrame, test::kMoreFollows, kTelephonyCreateLogChannelMessage, serial,
+                                  part))) {
+        break;
+      }
+    }
+    peers.push_back(std::move(peer));
+  }
+  std::vector<std::uint32_t> kept;
+  for (std::uint32_t serial = 1; serial <= 20; ++serial) {
+    if (!peers[serial - 1]->closedByThePort(50ms)) kept.push_back(serial);
+  }
+  // 16 MB hold at most four of them.
+  EXPECT_GE(kept.size(), 1u);
+  EXPECT_LE(kept.size(), 4u);
+  if (!kSanitized) {
+    // The sanitizer's allocator keeps freed memory in quarantine, so only a plain build shows what is held.
+    EXPECT_LT(residentBytes(daemon.pid()), before + 40 * 1024 * 1024)
+        << "before: " << before << ", after: " << residentBytes(daemon.pid());
+  }
+
+  // The peers kept are served: their requests finish and are answered (as malformed).
+  for (const std::uint32_t serial : kept) {
+    ASSERT_TRUE(peers[serial - 1]->send(
+        test::frame(test::kRequestFrame, 0, kTelephonyCreateLogChannelMessage, serial, Bytes{'x'})));
+    const auto reply = peers[serial - 1]->reply();
+    ASSERT_TRUE(reply);
+    const auto answer = plist::parse(*reply);
+    ASSERT_TRUE(answer && answer->asDictionary());
+    EXPECT_EQ(answer->asDictionary()->get(kTelephonyKeyErrorCode), Value::integer(kTelephonyErrorBadRequest));
+  }
+  // And so is everyone else.
+  Client client(ports_, loop_);
+  ASSERT_TRUE(client.connected());
+  EXPECT_EQ(client.technology(), "IFX");
+  EXPECT_EQ(daemon.stop(SIGTERM), 0);
+  const std::string log = contentsOf(errors);
+  EXPECT_EQ(occurrences(log, "Port corvane-telephonyd dropped a connection: its unfinished message"), 1u) << log;
+}
+
+// How soon the service ends on SIGTERM; the sanitizers add their own work at exit.
+constexpr auto kStopBound = kSanitized ? 600ms : 200ms;
+
+TEST_F(DaemonTest, SigtermEndsTheServiceAtOnceWhileSilentPeersHoldItWaiting) {
+  Daemon daemon(ports_, {});
+  const auto socket = ports_.socketPath(std::string(kTelephonyServicePortName));
+  // Three peers send requests and never read a reply: the service waits up to
+  // a second for room for each peer's next reply.
+  std::vector<std::unique_ptr<test::RawPeer>> silent;
+  for (std::uint32_t peer = 0; peer < 3; ++peer) {
+    silent.push_back(std::make_unique<test::RawPeer>(socket));
+    ASSERT_TRUE(silent.back()->connected());
+    // More requests than the replies that fit in the socket's buffer.
+    int full = 0;
+    for (std::uint32_t serial = 1; serial <= 600 && full < 50;) {
+      if (silent.back()->sendWithoutWaiting(test::frame(test::kRequestFrame, 0, 99, serial, Bytes{'?'}))) {
+        ++serial;
+        full = 0;
+      } else {
+        ++full;
+        std::this_thread::sleep_for(1ms);
+      }
+    }
+  }
+  // Until the service is held: a request of an ordinary client is not
+  // answered soon. Found early, most of the second is still to wait.
+  const auto giveUp = Clock::now() + 3s;
+  bool held = false;
+  while (!held && Clock::now() < giveUp) {
+    auto probe = ports_.createRemotePort(std::string(kTelephonyServicePortName));
+    ASSERT_TRUE(probe);
+    std::optional<Bytes> reply;
+    held = probe->sendRequest(99, Bytes{'?'}, 1.0, 0.05, &reply) == kPortReceiveTimeout;
+  }
+  ASSERT_TRUE(held);
+
+  const auto start = Clock::now();
+  EXPECT_EQ(daemon.stop(SIGTERM), 0);
+  const auto took = Clock::now() - start;
+  EXPECT_LT(took, kStopBound) << std::chrono::duration_cast<std::chrono::milliseconds>(took).count() << " ms";
+  EXPECT_TRUE(serviceSockets(runtime_.path()).empty());
+}
+
 TEST_F(DaemonTest, LogChannelForAnUnusablePortNameIsRefused) {
   Daemon daemon(ports_, {});
   SocketTelephonyClient telephony(ports_);
@@ -514,6 +708,18 @@ TEST_F(DaemonTest, UnusableRuntimeDirectoryExitsWithStatus1AndOneLine) {
   const auto result = test::runProcess({kDaemon}, "", {"CORVANE_RUNTIME_DIR=" + file});
   EXPECT_EQ(result.exitCode, 1);
   EXPECT_EQ(result.err, "corvane-telephonyd: runtime directory " + file + " is not a directory\n");
+}
+
+TEST_F(DaemonTest, RuntimeDirectoryThatIsASymbolicLinkIsRefusedAsSuch) {
+  test::TemporaryDirectory temporary;
+  const std::string link = temporary.path() + "/run";
+  ASSERT_EQ(::symlink(runtime_.path().c_str(), link.c_str()), 0);
+  const auto result = test::runProcess({kDaemon}, "", {"CORVANE_RUNTIME_DIR=" + link});
+  EXPECT_EQ(result.exitCode, 1);
+  EXPECT_EQ(result.err, "corvane-telephonyd: runtime directory " + link +
+                            " is a symbolic link, which is not followed; remove the link so that the directory is "
+                            "made afresh, or set CORVANE_RUNTIME_DIR to a private directory\n");
+  EXPECT_TRUE(serviceSockets(runtime_.path()).empty());
 }
 
 }  // namespace

@@ -19,6 +19,7 @@
 #include <thread>
 
 #include "PortServerThread.h"
+#include "RawPeer.h"
 #include "RuntimeTestDirectory.h"
 #include "platform/Log.h"
 #include "platform/SignalEvents.h"
@@ -385,62 +386,6 @@ TEST_F(SocketMessagePortTest, LocalPortReportsConnectionsOpeningAndClosing) {
   invalidateOnServer(local);
 }
 
-// The raw protocol, as a peer that does not use the library writes it: a
-// 16-byte little-endian frame header (kind, flags, reserved, message id,
-// serial, payload length) and the payload.
-constexpr std::uint8_t kRequestFrame = 2;
-constexpr std::uint8_t kMoreFollows = 0x01;
-
-Bytes frame(std::uint8_t kind, std::uint8_t flags, std::int32_t id, std::uint32_t serial, const Bytes& payload) {
-  Bytes out = {kind, flags, 0, 0};
-  for (std::uint32_t value : {static_cast<std::uint32_t>(id), serial, static_cast<std::uint32_t>(payload.size())}) {
-    for (int shift = 0; shift < 32; shift += 8) out.push_back(static_cast<std::uint8_t>(value >> shift));
-  }
-  out.insert(out.end(), payload.begin(), payload.end());
-  return out;
-}
-
-// A connection of a peer that writes raw datagrams.
-class RawPeer {
- public:
-  explicit RawPeer(const std::filesystem::path& socket) : fd_(::socket(AF_UNIX, SOCK_SEQPACKET | SOCK_CLOEXEC, 0)) {
-    sockaddr_un address{};
-    address.sun_family = AF_UNIX;
-    std::strncpy(address.sun_path, socket.c_str(), sizeof address.sun_path - 1);
-    connected_ = ::connect(fd_, reinterpret_cast<sockaddr*>(&address), sizeof address) == 0;
-  }
-  ~RawPeer() { ::close(fd_); }
-  RawPeer(const RawPeer&) = delete;
-  RawPeer& operator=(const RawPeer&) = delete;
-
-  bool connected() const { return connected_; }
-  bool send(const Bytes& datagram) { return ::send(fd_, datagram.data(), datagram.size(), MSG_NOSIGNAL) >= 0; }
-  // Whether the port has closed this connection (end of stream), waiting up to the limit.
-  bool closedByThePort(std::chrono::milliseconds limit = 2000ms) {
-    const auto giveUp = Clock::now() + limit;
-    for (;;) {
-      std::uint8_t buffer[kSocketPortMaximumDatagram];
-      const ssize_t n = ::recv(fd_, buffer, sizeof buffer, MSG_DONTWAIT);
-      if (n == 0 || (n < 0 && errno != EAGAIN && errno != EWOULDBLOCK)) return true;
-      if (Clock::now() > giveUp) return false;
-      if (n < 0) std::this_thread::sleep_for(1ms);
-    }
-  }
-  // The payload of the next reply, waiting up to a second.
-  std::optional<Bytes> reply() {
-    pollfd p{fd_, POLLIN, 0};
-    if (::poll(&p, 1, 1000) != 1) return std::nullopt;
-    Bytes buffer(kSocketPortMaximumDatagram);
-    const ssize_t n = ::recv(fd_, buffer.data(), buffer.size(), MSG_DONTWAIT);
-    if (n < 16) return std::nullopt;
-    return Bytes(buffer.begin() + 16, buffer.begin() + n);
-  }
-
- private:
-  int fd_;
-  bool connected_ = false;
-};
-
 std::size_t linesContaining(const log::CapturingSink& sink, std::string_view part) {
   const auto texts = sink.texts();
   return static_cast<std::size_t>(
@@ -552,18 +497,18 @@ TEST_F(SocketMessagePortTest, UnfinishedMessagesBeyondTheLimitDropTheirConnectio
                               "held for unfinished messages past 262144 bytes; dropping such connections quietly "
                               "until none is held";
   // Eight peers start a message of three parts of 40 KB and stop there.
-  std::vector<std::unique_ptr<RawPeer>> peers;
+  std::vector<std::unique_ptr<test::RawPeer>> peers;
   for (std::uint32_t serial = 1; serial <= 8; ++serial) {
-    auto peer = std::make_unique<RawPeer>(limited.socketPath("assembling"));
+    auto peer = std::make_unique<test::RawPeer>(limited.socketPath("assembling"));
     ASSERT_TRUE(peer->connected());
-    for (int i = 0; i < 3; ++i) peer->send(frame(kRequestFrame, kMoreFollows, 9, serial, part));
+    for (int i = 0; i < 3; ++i) peer->send(test::frame(test::kRequestFrame, test::kMoreFollows, 9, serial, part));
     peers.push_back(std::move(peer));
   }
   ASSERT_TRUE(eventually([&] { return linesContaining(capture.sink(), "unfinished message") == 1; }));
-  std::vector<RawPeer*> dropped;
-  std::vector<std::pair<RawPeer*, std::uint32_t>> kept;
+  std::vector<test::RawPeer*> dropped;
+  std::vector<std::pair<test::RawPeer*, std::uint32_t>> kept;
   for (std::uint32_t serial = 1; serial <= 8; ++serial) {
-    RawPeer* peer = peers[serial - 1].get();
+    test::RawPeer* peer = peers[serial - 1].get();
     if (peer->closedByThePort(100ms)) {
       dropped.push_back(peer);
     } else {
@@ -576,16 +521,18 @@ TEST_F(SocketMessagePortTest, UnfinishedMessagesBeyondTheLimitDropTheirConnectio
   EXPECT_EQ(capture.sink().count(refusal), 1u);
   // The peers kept are served: their messages finish and are answered.
   for (auto [peer, serial] : kept) {
-    ASSERT_TRUE(peer->send(frame(kRequestFrame, 0, 9, serial, bytes("end"))));
+    ASSERT_TRUE(peer->send(test::frame(test::kRequestFrame, 0, 9, serial, bytes("end"))));
     EXPECT_EQ(peer->reply(), bytes("got " + std::to_string(3 * part.size() + 3)));
   }
   ASSERT_TRUE(eventually([&] { return limited.shared().unfinishedMessageBytes() == 0; }));
 
   // With nothing held, the next wave of refusals is reported again, once.
-  std::vector<std::unique_ptr<RawPeer>> wave;
+  std::vector<std::unique_ptr<test::RawPeer>> wave;
   for (std::uint32_t serial = 1; serial <= 8; ++serial) {
-    wave.push_back(std::make_unique<RawPeer>(limited.socketPath("assembling")));
-    for (int i = 0; i < 3; ++i) wave.back()->send(frame(kRequestFrame, kMoreFollows, 9, serial, part));
+    wave.push_back(std::make_unique<test::RawPeer>(limited.socketPath("assembling")));
+    for (int i = 0; i < 3; ++i) {
+      wave.back()->send(test::frame(test::kRequestFrame, test::kMoreFollows, 9, serial, part));
+    }
   }
   ASSERT_TRUE(eventually([&] { return capture.sink().count(refusal) == 2; }));
   wave.clear();
@@ -682,7 +629,7 @@ TEST_F(SocketMessagePortTest, AfterStopWaitingNothingWaitsButWhatTheSocketTakesA
   std::strncpy(address.sun_path, ports_.socketPath("behind").c_str(), sizeof address.sun_path - 1);
   ASSERT_EQ(::bind(listener, reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
   ASSERT_EQ(::listen(listener, 0), 0);
-  RawPeer waiting(ports_.socketPath("behind"));  // fills the backlog of one
+  test::RawPeer waiting(ports_.socketPath("behind"));  // fills the backlog of one
   ASSERT_TRUE(waiting.connected());
   start = Clock::now();
   std::string error;
