@@ -39,9 +39,11 @@ inline constexpr std::string_view kNotPresentText = "Not Present";
 Text decimalText(std::uint32_t value);
 Text decimalText(std::int32_t value);
 // "%d" followed by the unit ("%d dBm").
-Text wholeText(std::int64_t value, std::string_view unit);
+Text wholeText(std::int64_t value, const records::Unit& unit);
 // "%4.2f" followed by the unit, exactly as printf writes the double.
-Text fixedText(double value, std::string_view unit);
+Text fixedText(double value, const records::Unit& unit);
+// fixedText of eighths / 8, in integer arithmetic.
+Text eighthsText(std::int64_t eighths, const records::Unit& unit);
 inline std::string_view trueFalseText(bool value) { return value ? "True" : "False"; }
 
 // The text of the value in the table, or the fallback.
@@ -54,10 +56,24 @@ constexpr std::string_view textFor(std::span<const records::ValueText> table, st
 }
 
 // What a raw value shows through its conversion.
-Text conversionText(const records::Conversion& conversion, std::uint32_t raw);
+[[gnu::always_inline]] inline Text conversionText(const records::Conversion& conversion, std::uint32_t raw) {
+  using Kind = records::Conversion::Kind;
+  if (conversion.isNotPresent(raw)) return Text(kNotPresentText);
+  switch (conversion.kind) {
+    case Kind::Decimal: return decimalText(raw);
+    case Kind::Fixed:
+      return conversion.inEighths ? eighthsText(conversion.eighths(raw), conversion.unit)
+                                  : fixedText(conversion.value(raw), conversion.unit);
+    case Kind::Whole: return wholeText(conversion.wholeValue(raw), conversion.unit);
+    case Kind::Table: return Text(textFor(conversion.table, raw, conversion.fallback));
+    case Kind::Flag: return Text(trueFalseText(raw != 0));
+  }
+  return Text();
+}
 
 // What a field of a packet shows, in the list entry that begins `entry` bytes in.
-inline Text fieldText(const records::Field& field, const PacketView& packet, std::size_t entry = 0) {
+[[gnu::always_inline]] inline Text fieldText(const records::Field& field, const PacketView& packet,
+                                             std::size_t entry = 0) {
   return conversionText(field.conversion, field.raw(packet, entry));
 }
 

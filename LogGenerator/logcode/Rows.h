@@ -5,7 +5,7 @@
 // field of the packet shown through its conversion, listed as data:
 //
 //   constexpr RowField kRows[] = {{"Version", layout::kVersion}, ...};
-//   writeRows(rows, kRows, packet);
+//   writeRows<kRows>(rows, packet);
 //
 // and a list's row shape is made from the same table, so a key is typed once.
 //
@@ -20,6 +20,7 @@
 #include <optional>
 #include <span>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 #include "LogGenerator/logcode/Base.h"
@@ -61,6 +62,23 @@ class RowWriter {
 inline void writeRows(RowWriter& rows, std::span<const RowField> table, const PacketView& packet,
                       std::size_t entry = 0) {
   for (const RowField& row : table) rows.set(row.key, fieldText(row.field, packet, entry));
+}
+
+namespace rows_detail {
+template <const auto& Table, std::size_t... I>
+inline void writeEach(RowWriter& rows, const PacketView& packet, std::size_t entry, std::index_sequence<I...>) {
+  (rows.set(Table[I].key, fieldText(Table[I].field, packet, entry)), ...);
+}
+}  // namespace rows_detail
+
+// The same for a constant table, written out row by row at compile time:
+// each row's conversion is known there, so a row costs its read and its text
+// and nothing to choose them. The form for the tables of the sections.
+//
+//   writeRows<kRows>(rows, packet);
+template <const auto& Table>
+inline void writeRows(RowWriter& rows, const PacketView& packet, std::size_t entry = 0) {
+  rows_detail::writeEach<Table>(rows, packet, entry, std::make_index_sequence<std::size(Table)>());
 }
 
 // The keys of a list's rows, in the order they are written. A new row is a

@@ -24,7 +24,7 @@ void ConnectedModeMeasurementMisc::updateWithData(std::span<const std::uint8_t> 
       acceptPacket("Connected mode LTE Intra-frequency Measurement", data, logCode, kCode, kMinimumLength);
   if (!packet) return;
   RowWriter rows(*this);
-  writeRows(rows, kRows, *packet);
+  writeRows<kRows>(rows, *packet);
 }
 
 }  // namespace corvane

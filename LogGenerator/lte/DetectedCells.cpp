@@ -28,7 +28,7 @@ void DetectedCells::updateWithData(std::span<const std::uint8_t> data, std::uint
   if (detected.count() == 0) return;
   list.install(rowsOfEntries(*packet, detected, kDetectedCellSize, [&](std::size_t cell) {
     RowWriter row = kCellRow.makeRow();
-    writeRows(row, kCellRows, *packet, cell);
+    writeRows<kCellRows>(row, *packet, cell);
     return row.value();
   }));
 }

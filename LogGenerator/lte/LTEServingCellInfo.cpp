@@ -84,11 +84,11 @@ void LTEServingCellInfo::updateFromAntennaInfo(const PacketView& packet) const {
 void LTEServingCellInfo::updateFromCellIdentity(const PacketView& packet) const {
   if (packet.size() < lte::cell_identity::kMinimumLength) return;
   RowWriter rows(*this);
-  writeRows(rows, kCarrierRowsBeforeUarfcn, packet);
+  writeRows<kCarrierRowsBeforeUarfcn>(rows, packet);
   // A UARFCN comes only with the cell-monitor list; a fresh baseband record of
   // the carrier makes the last one stale.
   rows.remove("UARFCN");
-  writeRows(rows, kCarrierRowsAfterUarfcn, packet);
+  writeRows<kCarrierRowsAfterUarfcn>(rows, packet);
 }
 
 void LTEServingCellInfo::updateFromCellList(std::span<const std::uint8_t> data) const {

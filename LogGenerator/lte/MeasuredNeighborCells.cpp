@@ -30,7 +30,7 @@ void MeasuredNeighborCells::updateWithData(std::span<const std::uint8_t> data, s
   if (measured.count() == 0) return;
   list.install(rowsOfEntries(*packet, measured, kMeasuredCells.entrySize, [&](std::size_t cell) {
     RowWriter row = kCellRow.makeRow();
-    writeRows(row, kCellRows, *packet, cell);
+    writeRows<kCellRows>(row, *packet, cell);
     return row.value();
   }));
 }

@@ -56,7 +56,7 @@ void NeighborCellsList::updateWithData(std::span<const std::uint8_t> data, std::
   list.install(rowsOfEntries(*packet, neighbors, kCells.entrySize, [&](std::size_t cell) {
     if (traced) traceCell(*packet, cell);
     RowWriter row = kCellRow.makeRow();
-    writeRows(row, kCellRows, *packet, cell);
+    writeRows<kCellRows>(row, *packet, cell);
     return row.value();
   }));
 }

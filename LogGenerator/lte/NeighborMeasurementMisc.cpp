@@ -21,7 +21,7 @@ void NeighborMeasurementMisc::updateWithData(std::span<const std::uint8_t> data,
   const auto packet = acceptPacket("Neighbor Measurements", data, logCode, kCode, kMinimumLength);
   if (!packet) return;
   RowWriter rows(*this);
-  writeRows(rows, kRows, *packet);
+  writeRows<kRows>(rows, *packet);
 }
 
 }  // namespace corvane

@@ -21,7 +21,7 @@ void ReselectionCandidatesMisc::updateWithData(std::span<const std::uint8_t> dat
   const auto packet = acceptPacket("Reselection Candidates", data, logCode, kCode, kMinimumLength);
   if (!packet) return;
   RowWriter rows(*this);
-  writeRows(rows, kRows, *packet);
+  writeRows<kRows>(rows, *packet);
 }
 
 }  // namespace corvane

@@ -36,7 +36,7 @@ void ServingCellMeasurement::updateWithData(std::span<const std::uint8_t> data, 
   const auto packet = acceptPacket("Serving Cell Measurements", data, logCode, kCode, kMinimumLength);
   if (!packet) return;
   RowWriter rows(*this);
-  writeRows(rows, kRows, *packet);
+  writeRows<kRows>(rows, *packet);
 }
 
 }  // namespace corvane

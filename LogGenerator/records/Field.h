@@ -9,6 +9,7 @@
 //
 // Header-only: the simulator uses it without linking the decoders.
 
+#include <array>
 #include <cmath>
 #include <cstddef>
 #include <cstdint>
@@ -27,6 +28,28 @@ struct ValueText {
   std::string_view text;
 };
 
+// The unit written behind a number (" dBm"). Units are short and kept in
+// place, so that a display text takes one whole in a single move.
+struct Unit {
+  static constexpr std::size_t kCapacity = 11;
+  std::array<char, kCapacity> chars{};
+  std::uint8_t size = 0;
+
+  constexpr Unit() = default;
+  // Throws std::logic_error (a compile error for a constant) for a unit longer
+  // than kCapacity.
+  constexpr Unit(std::string_view text) {  // NOLINT: a unit is written as its text
+    if (text.size() > kCapacity) throw std::logic_error("a unit holds at most 11 characters");
+    for (std::size_t i = 0; i < text.size(); ++i) chars[i] = text[i];
+    size = static_cast<std::uint8_t>(text.size());
+  }
+  template <std::size_t N>
+  constexpr Unit(const char (&text)[N]) : Unit(std::string_view(text, N - 1)) {}  // NOLINT: as above
+  constexpr std::string_view view() const { return {chars.data(), size}; }
+  constexpr operator std::string_view() const { return view(); }
+  constexpr bool empty() const { return size == 0; }
+};
+
 // How a raw field value becomes a display value.
 struct Conversion {
   enum class Kind : std::uint8_t {
@@ -40,12 +63,23 @@ struct Conversion {
   Kind kind = Kind::Decimal;
   double step = 1;
   double origin = 0;
-  std::string_view unit{};
+  Unit unit{};
   // A raw value that means "not present" rather than a measurement.
   bool hasNotPresent = false;
   std::uint32_t notPresent = 0;
   std::span<const ValueText> table{};
   std::string_view fallback{};
+  // For Fixed: when step and origin are whole numbers of eighths (every
+  // scaling the basebands use), x × step + origin counted in eighths, so the
+  // display text is made with integer arithmetic alone.
+  bool inEighths = false;
+  std::int64_t eighthStep = 0;
+  std::int64_t eighthOrigin = 0;
+
+  // x × step + origin in eighths; only for conversions inEighths.
+  constexpr std::int64_t eighths(std::uint32_t raw) const {
+    return static_cast<std::int64_t>(raw) * eighthStep + eighthOrigin;
+  }
 
   bool isNotPresent(std::uint32_t raw) const { return hasNotPresent && raw == notPresent; }
 
@@ -60,9 +94,8 @@ struct Conversion {
   }
   std::int32_t wholeValue(std::uint32_t raw) const {
     // Computed wide, then cut to 16 bits as the display has always shown it.
-    const auto wide = static_cast<std::int64_t>(raw) * static_cast<std::int64_t>(step) +
-                      static_cast<std::int64_t>(origin);
-    return static_cast<std::int16_t>(wide);
+    // A whole step and origin are whole numbers of eighths too.
+    return static_cast<std::int16_t>(eighths(raw) / 8);
   }
 
   // The raw value that shows as `value`: the inverse that encoders use.
@@ -89,6 +122,20 @@ constexpr Conversion fixed(double step, double origin, std::string_view unit) {
   c.step = step;
   c.origin = origin;
   c.unit = unit;
+  // Small enough that any 32-bit raw value times the step, plus the origin,
+  // fits 63 bits.
+  constexpr double kStepLimit = 1 << 30;
+  constexpr double kOriginLimit = 1e12;
+  const double eighthStep = step * 8;
+  const double eighthOrigin = origin * 8;
+  if (eighthStep > -kStepLimit && eighthStep < kStepLimit && eighthOrigin > -kOriginLimit &&
+      eighthOrigin < kOriginLimit &&
+      eighthStep == static_cast<double>(static_cast<std::int64_t>(eighthStep)) &&
+      eighthOrigin == static_cast<double>(static_cast<std::int64_t>(eighthOrigin))) {
+    c.inEighths = true;
+    c.eighthStep = static_cast<std::int64_t>(eighthStep);
+    c.eighthOrigin = static_cast<std::int64_t>(eighthOrigin);
+  }
   return c;
 }
 constexpr Conversion whole(int step, int origin, std::string_view unit) {
