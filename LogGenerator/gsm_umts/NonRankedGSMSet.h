@@ -1,0 +1,15 @@
+#pragma once
+
+// "Non-Ranked GSM Set": a placeholder section that takes no packets; it shows what the
+// display template gives it.
+
+#include "LogGenerator/logcode/Base.h"
+
+namespace corvane {
+
+class NonRankedGSMSet final : public Base {
+ public:
+  void updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) override;
+};
+
+}  // namespace corvane

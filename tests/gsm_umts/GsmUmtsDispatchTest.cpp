@@ -1,0 +1,152 @@
+// The GSM/UMTS sections as the technology runs them: registered in the class
+// index in the order of its table, given their containers by the "QND_GSM"
+// display template, and reached through the generator's dispatch.
+
+#include <gtest/gtest.h>
+
+#include "LogGenerator/gsm_umts/QND_GSMClassIndex.h"
+#include "LogGenerator/gsm_umts/QND_GSMLogGenerator.h"
+#include "gsm_umts/GsmCellPackets.h"
+#include "gsm_umts/GsmUmtsSectionFixture.h"
+
+namespace corvane {
+namespace {
+
+using test::I;
+using test::logPacket;
+using test::monitorCell;
+using test::put16;
+
+const Value* findSection(const Value& node, std::string_view name) {
+  if (const Dictionary* d = node.asDictionary()) {
+    for (const auto& [key, value] : d->entries()) {
+      if (key == name) return &value;
+      if (const Value* found = findSection(value, name)) return found;
+    }
+  }
+  return nullptr;
+}
+
+std::vector<std::string> sectionNames(const CodeDictionary::Subscribers* subscribers) {
+  std::vector<std::string> names;
+  if (subscribers) {
+    for (const auto& s : *subscribers) names.push_back(s->getSectionName());
+  }
+  return names;
+}
+
+std::vector<std::string> warningTexts(const log::ScopedCapture& capture) {
+  std::vector<std::string> texts;
+  for (const auto& line : capture.lines()) {
+    if (line.priority == log::kWarning) texts.push_back(line.text);
+  }
+  return texts;
+}
+
+class GsmUmtsDispatch : public ::testing::Test {
+ protected:
+  GsmUmtsDispatch() {
+    log::ScopedCapture quiet;
+    generator = std::make_unique<QND_GSMLogGenerator>();
+    generator->getDisplayFromState(state);
+    display = state.get("Display");
+  }
+
+  std::string rowText(std::string_view section, std::string_view row) const {
+    const Value* rows = findSection(display, section);
+    const Value* v = rows && rows->asDictionary() ? rows->asDictionary()->find(row) : nullptr;
+    return v && v->asString() ? *v->asString() : "<none>";
+  }
+  std::size_t listSize(std::string_view section) const {
+    const Value* list = findSection(display, section);
+    return list && list->asArray() ? list->asArray()->size() : 9999;
+  }
+
+  std::unique_ptr<QND_GSMLogGenerator> generator;
+  Dictionary state;
+  Value display;
+};
+
+TEST(GsmUmtsClassIndex, SectionsSharingACodeAreCalledInTheOrderOfTheTable) {
+  log::ScopedCapture quiet;
+  QND_GSMClassIndex index;
+  EXPECT_EQ(sectionNames(index.getSubscribers(0x417A)),
+            (std::vector<std::string>{"Active Set", "Detected Set", "Monitored Set", "Virtual Active Set"}));
+  EXPECT_EQ(sectionNames(index.getSubscribers(0x5137)),
+            (std::vector<std::string>{"GSM Serving Cell", "Neighboring Cells"}));
+  EXPECT_EQ(sectionNames(index.getSubscribers(0x4005)), (std::vector<std::string>{"GSM Set", "UMTS Set"}));
+  EXPECT_EQ(sectionNames(index.getSubscribers(0xFF0001)),
+            (std::vector<std::string>{"GSM Serving Cell", "Neighboring Cells", "Serving PLMN", "UMTS Set",
+                                      "UMTS RR Info"}));
+  EXPECT_EQ(index.sectionNames().size(), 20u);
+}
+
+TEST(GsmUmtsClassIndex, TheStartCommandListsTheSetLogOnceAndTheThreeExtraCodes) {
+  log::ScopedCapture quiet;
+  QND_GSMLogGenerator generator;
+  const Dictionary command = generator.getStartCommand();
+  std::vector<std::int64_t> codes;
+  for (const Value& v : command.find("SetQuendraLogCodes")->asArray()->elements()) codes.push_back(*v.asInteger());
+  EXPECT_EQ(std::count(codes.begin(), codes.end(), 0x417A), 1);
+  std::vector<std::int64_t> extra;
+  for (const Value& v : command.find("SetTsExtraCodes")->asArray()->elements()) extra.push_back(*v.asInteger());
+  std::sort(extra.begin(), extra.end());
+  EXPECT_EQ(extra, (std::vector<std::int64_t>{0, 1, 2}));
+}
+
+TEST_F(GsmUmtsDispatch, TheTemplateShowsEveryRowBeforeAnyPacket) {
+  EXPECT_EQ(rowText("Serving PLMN", "PLMN Sel Mod"), "-");
+  EXPECT_EQ(rowText("GSM Serving Cell", "MA Dedicated ARFCN"), "-");
+  EXPECT_EQ(rowText("UMTS RR Info", "UARFCN"), "-");
+  EXPECT_EQ(rowText("BLER", "Window Size"), "-");
+  EXPECT_EQ(listSize("Active Set"), 0u);
+  EXPECT_EQ(listSize("Non-Ranked GSM Set"), 0u);
+}
+
+TEST_F(GsmUmtsDispatch, ACellMeasurementReachesTheServingCellAndTheNeighbours) {
+  log::ScopedCapture capture;
+  generator->updateWithData(test::gsmMeasurementPacket(60, -5, 3, {{62, 30, -5}}));
+  EXPECT_EQ(warningTexts(capture), (std::vector<std::string>{"GSMServingCell", "NeighboringCells"}));
+  EXPECT_EQ(rowText("GSM Serving Cell", "C1 Value"), "65531");
+  const Value* neighbours = findSection(display, "Neighboring Cells");
+  ASSERT_TRUE(neighbours && neighbours->asArray() && neighbours->asArray()->size() == 1);
+  EXPECT_EQ(*neighbours->asArray()->at(0).asDictionary()->find("C1 Value"), Value("-5"));
+}
+
+// The GSM list's count at 14 and the UMTS list's at 13 both count entries from 15.
+TEST_F(GsmUmtsDispatch, ARankedListReachesTheGsmSetThenTheUmtsSetWhichReadTheSameBytes) {
+  Bytes p = logPacket(0x4005, 15 + 10);
+  p[13] = 1;
+  p[14] = 1;
+  put16(p, 15, 10700);
+  put16(p, 17, 41);
+  log::ScopedCapture capture;
+  generator->updateWithData(p);
+  EXPECT_EQ(warningTexts(capture), (std::vector<std::string>{"GSMSet", "UMTSSet"}));
+  EXPECT_EQ(listSize("GSM Set"), 1u);
+  EXPECT_EQ(listSize("UMTS Set"), 1u);
+  const Value* gsm = findSection(display, "GSM Set");
+  const Value* umts = findSection(display, "UMTS Set");
+  EXPECT_EQ(*gsm->asArray()->at(0).asDictionary()->find("ARFCN"), Value("10700"));
+  EXPECT_EQ(*umts->asArray()->at(0).asDictionary()->find("Downlink Frequency"), Value("10700"));
+  EXPECT_EQ(*gsm->asArray()->at(0).asDictionary()->find("BSIC"), Value("41"));
+  EXPECT_EQ(*umts->asArray()->at(0).asDictionary()->find("Scrambling Code"), Value("41"));
+}
+
+TEST_F(GsmUmtsDispatch, ACellListWhoseServingCellIsUmtsFillsServingPlmnButNotTheGsmServingCell) {
+  log::ScopedCapture capture;
+  generator->updateWithData(test::cellListPacket({monitorCell(
+      test::kUmts, test::kServing,
+      {{CellMonitorMCC, I(262)}, {CellMonitorMNC, I(1)}, {CellMonitorLAC, I(4660)}, {CellMonitorCellId, I(99)},
+       {CellMonitorARFCN, I(10)}, {CellMonitorUARFCN, I(10713)}, {CellMonitorSCN, I(300)}})}));
+  EXPECT_EQ(rowText("Serving PLMN", "Mobile Country Code"), "262");
+  EXPECT_EQ(rowText("Serving PLMN", "Mobile Network Code"), "1");
+  EXPECT_EQ(rowText("Serving PLMN", "Location Area Code"), "4660");
+  EXPECT_EQ(rowText("GSM Serving Cell", "Cell ID"), "-");
+  EXPECT_EQ(rowText("GSM Serving Cell", "ARFCN"), "-");
+  EXPECT_EQ(rowText("UMTS RR Info", "Cell ID"), "99");
+  EXPECT_EQ(rowText("UMTS RR Info", "UARFCN"), "10713");
+}
+
+}  // namespace
+}  // namespace corvane
