@@ -6,7 +6,7 @@ set -euo pipefail
 packages=(
   build-essential cmake ninja-build pkg-config git ccache
   clang libclang-rt-14-dev
-  qt6-base-dev libplist-dev nlohmann-json3-dev
+  qt6-base-dev libplist-dev nlohmann-json3-dev libcrcutil-dev
   libgtest-dev libgmock-dev libbenchmark-dev
   libqt6svg6 fonts-dejavu-core libplist-utils xvfb xauth dbus-daemon
 )
