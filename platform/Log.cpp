@@ -1,10 +1,15 @@
 #include "platform/Log.h"
 
+#include <sys/socket.h>
+#include <sys/un.h>
 #include <syslog.h>
+#include <unistd.h>
 
+#include <cerrno>
 #include <cinttypes>
 #include <cstdarg>
 #include <cstdio>
+#include <cstring>
 #include <iostream>
 
 namespace corvane::log {
@@ -15,8 +20,21 @@ std::mutex& sinkMutex() {
   return m;
 }
 std::shared_ptr<Sink>& currentSink() {
-  static std::shared_ptr<Sink> s = std::make_shared<SyslogSink>();
+  static std::shared_ptr<Sink> s = makeSystemLogSink();
   return s;
+}
+
+constexpr const char* kIdent = "corvane";
+constexpr int kOptions = LOG_PID | LOG_NDELAY;
+
+int connectedSocket(int type, const sockaddr_un& address) {
+  const int fd = ::socket(AF_UNIX, type | SOCK_CLOEXEC, 0);
+  if (fd < 0) return -1;
+  if (::connect(fd, reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0) return fd;
+  const int saved = errno;
+  ::close(fd);
+  errno = saved;
+  return -1;
 }
 
 // One formatting pass for the usual short line; a longer one is measured by
@@ -36,15 +54,96 @@ __attribute__((format(printf, 1, 0))) std::string vformat(const char* fmt, va_li
 }
 }  // namespace
 
-SyslogSink::SyslogSink() { openlog("corvane", LOG_PID, LOG_USER); }
+const char* systemLogSocket() { return _PATH_LOG; }
+
+bool logDaemonListens(const char* path) {
+  sockaddr_un address{};
+  if (std::strlen(path) >= sizeof address.sun_path) return false;
+  address.sun_family = AF_UNIX;
+  std::strcpy(address.sun_path, path);
+  int fd = connectedSocket(SOCK_DGRAM, address);
+  if (fd < 0 && errno == EPROTOTYPE) fd = connectedSocket(SOCK_STREAM, address);
+  if (fd < 0) return false;
+  ::close(fd);
+  return true;
+}
+
+SyslogSink::SyslogSink()
+    : SyslogSink([] { return logDaemonListens(systemLogSocket()); }, std::chrono::steady_clock::now) {}
+
+SyslogSink::SyslogSink(std::function<bool()> daemonListens, SteadyClock clock)
+    : daemonListens_(std::move(daemonListens)), clock_(std::move(clock)) {
+  present_.store(daemonListens_());
+  nextCheck_.store((clock_() + kDaemonCheckInterval).time_since_epoch().count());
+  // Connects now, and keeps the connection, when a daemon listens.
+  if (present_.load()) openlog(kIdent, kOptions, LOG_USER);
+}
+
+bool SyslogSink::daemonPresent() const {
+  const auto now = clock_().time_since_epoch().count();
+  if (now < nextCheck_.load(std::memory_order_relaxed)) return present_.load(std::memory_order_relaxed);
+  std::lock_guard lock(checkMutex_);
+  if (now >= nextCheck_.load()) {
+    const bool listens = daemonListens_();
+    // A daemon back (or new): connect at once rather than on the first line.
+    // One that went is left to syslog(3), which connects anew when it returns.
+    if (listens && !present_.load()) openlog(kIdent, kOptions, LOG_USER);
+    present_.store(listens);
+    using Duration = std::chrono::steady_clock::duration;
+    nextCheck_.store(now + std::chrono::duration_cast<Duration>(kDaemonCheckInterval).count());
+  }
+  return present_.load();
+}
 
 void SyslogSink::write(int priority, std::string_view text) {
+  if (!daemonPresent()) return;
   syslog(priority, "%.*s", static_cast<int>(text.size()), text.data());
 }
 
 bool SyslogSink::wants(int priority) const {
   // setlogmask(0) reads the mask without changing it.
-  return (setlogmask(0) & LOG_MASK(LOG_PRI(priority))) != 0;
+  return (setlogmask(0) & LOG_MASK(LOG_PRI(priority))) != 0 && daemonPresent();
+}
+
+RepeatCollapsingSink::RepeatCollapsingSink(std::shared_ptr<Sink> next, SteadyClock clock)
+    : next_(std::move(next)), clock_(std::move(clock)) {}
+
+RepeatCollapsingSink::~RepeatCollapsingSink() { flush(); }
+
+std::string RepeatCollapsingSink::repeatsLine(std::string_view text, std::uint64_t repeats) {
+  return std::string(text) + " (repeated " + std::to_string(repeats) + (repeats == 1 ? " more time)" : " more times)");
+}
+
+void RepeatCollapsingSink::write(int priority, std::string_view text) {
+  std::lock_guard lock(mutex_);
+  const auto now = clock_();
+  if (holding_ && priority == priority_ && text == text_ && now - writtenAt_ < kWindow) {
+    ++repeats_;
+    return;
+  }
+  flushLocked();
+  next_->write(priority, text);
+  holding_ = true;
+  priority_ = priority;
+  text_.assign(text);
+  writtenAt_ = now;
+}
+
+void RepeatCollapsingSink::flush() {
+  std::lock_guard lock(mutex_);
+  flushLocked();
+  next_->flush();
+}
+
+void RepeatCollapsingSink::flushLocked() {
+  if (repeats_ == 0) return;
+  const std::uint64_t repeats = repeats_;
+  repeats_ = 0;
+  if (next_->wants(priority_)) next_->write(priority_, repeatsLine(text_, repeats));
+}
+
+std::shared_ptr<Sink> makeSystemLogSink() {
+  return std::make_shared<RepeatCollapsingSink>(std::make_shared<SyslogSink>());
 }
 
 void StderrSink::write(int priority, std::string_view text) {
@@ -62,6 +161,10 @@ bool TeeSink::wants(int priority) const {
     if (s->wants(priority)) return true;
   }
   return false;
+}
+
+void TeeSink::flush() {
+  for (auto& s : sinks_) s->flush();
 }
 
 void CapturingSink::write(int priority, std::string_view text) {
@@ -102,6 +205,10 @@ void setSink(std::shared_ptr<Sink> s) {
 std::shared_ptr<Sink> sink() {
   std::lock_guard lock(sinkMutex());
   return currentSink();
+}
+
+void flush() {
+  if (auto s = sink()) s->flush();
 }
 
 bool wants(int priority) {

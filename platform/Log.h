@@ -2,9 +2,13 @@
 
 // The system log. Every line has a syslog priority: 3 for failures, 4 for
 // traces, 5 in one place, and 16 passed on as it is. Production code writes to
-// syslog(3) with ident "corvane"; tests install a capturing sink and assert the
-// exact lines.
+// syslog(3) with ident "corvane" (makeSystemLogSink); tests install a capturing
+// sink and assert the exact lines.
 
+#include <atomic>
+#include <chrono>
+#include <cstdint>
+#include <functional>
 #include <memory>
 #include <mutex>
 #include <string>
@@ -25,16 +29,85 @@ class Sink {
   // never formatted, which keeps per-packet traces cheap when nobody reads
   // them; a sink that records a priority must say so here.
   virtual bool wants(int /*priority*/) const { return true; }
+  // Writes out what the sink holds back (a count of repeats); also done when
+  // it is destroyed.
+  virtual void flush() {}
 };
 
+using SteadyClock = std::function<std::chrono::steady_clock::time_point()>;
+
+// The system log's socket, where syslog(3) sends.
+const char* systemLogSocket();
+// Whether a log daemon takes connections on the Unix-domain socket at `path`
+// (datagram or stream, as syslog(3) tries them).
+bool logDaemonListens(const char* path);
+
+// syslog(3), ident "corvane". The connection to the log daemon is opened once
+// (LOG_NDELAY) and kept; when the daemon restarts, syslog(3) connects anew on
+// the first line that fails to go. Whether a daemon listens at all is checked
+// at most once a second: without one, the sink wants no line (so none is even
+// formatted) and nothing tries to connect per line, as syslog(3) alone would;
+// once one listens again, the sink connects and takes lines again. A daemon
+// that goes away is noticed at the next check, within a second.
 class SyslogSink final : public Sink {
  public:
   SyslogSink();
+  // For tests: how to tell whether a daemon listens, and the clock of the checks.
+  SyslogSink(std::function<bool()> daemonListens, SteadyClock clock);
   void write(int priority, std::string_view text) override;
   // What the process's syslog mask lets through (all priorities unless
-  // setlogmask(3) narrowed it); syslog(3) would drop the rest anyway.
+  // setlogmask(3) narrowed it), while a log daemon listens.
   bool wants(int priority) const override;
+
+  static constexpr std::chrono::seconds kDaemonCheckInterval{1};
+
+ private:
+  bool daemonPresent() const;
+
+  std::function<bool()> daemonListens_;
+  SteadyClock clock_;
+  mutable std::mutex checkMutex_;
+  mutable std::atomic<std::chrono::steady_clock::rep> nextCheck_;
+  mutable std::atomic<bool> present_{false};
 };
+
+// Passes lines on to another sink, but a line that repeats (same priority,
+// same text) within a second of being written is written once: the repeats
+// are counted, and one line "<text> (repeated N more times)" follows, at the
+// same priority, when a different line arrives, on the first line after the
+// second has passed, or on flush and destruction. A flood of one message
+// (a phone streaming thousands of packets a second, each failing alike) so
+// costs the system log two lines a second. Wants what the sink behind it wants.
+class RepeatCollapsingSink final : public Sink {
+ public:
+  explicit RepeatCollapsingSink(std::shared_ptr<Sink> next, SteadyClock clock = std::chrono::steady_clock::now);
+  ~RepeatCollapsingSink() override;
+  RepeatCollapsingSink(const RepeatCollapsingSink&) = delete;
+  RepeatCollapsingSink& operator=(const RepeatCollapsingSink&) = delete;
+
+  void write(int priority, std::string_view text) override;
+  bool wants(int priority) const override { return next_->wants(priority); }
+  void flush() override;
+
+  static constexpr std::chrono::seconds kWindow{1};
+  // "<text> (repeated 1 more time)", "<text> (repeated 5 more times)".
+  static std::string repeatsLine(std::string_view text, std::uint64_t repeats);
+
+ private:
+  void flushLocked();
+
+  std::shared_ptr<Sink> next_;
+  SteadyClock clock_;
+  std::mutex mutex_;
+  bool holding_ = false;
+  int priority_ = 0;
+  std::string text_;
+  std::chrono::steady_clock::time_point writtenAt_{};
+  std::uint64_t repeats_ = 0;
+};
+
+// The system log as production code uses it: repeats collapsed, then syslog(3).
+std::shared_ptr<Sink> makeSystemLogSink();
 
 // Writes "<priority> <text>" lines to standard error.
 class StderrSink final : public Sink {
@@ -48,6 +121,7 @@ class TeeSink final : public Sink {
   explicit TeeSink(std::vector<std::shared_ptr<Sink>> sinks) : sinks_(std::move(sinks)) {}
   void write(int priority, std::string_view text) override;
   bool wants(int priority) const override;
+  void flush() override;
 
  private:
   std::vector<std::shared_ptr<Sink>> sinks_;
@@ -74,9 +148,11 @@ class CapturingSink final : public Sink {
   std::vector<Line> lines_;
 };
 
-// The sink all logging goes to; syslog until replaced.
+// The sink all logging goes to; makeSystemLogSink() until replaced.
 void setSink(std::shared_ptr<Sink> sink);
 std::shared_ptr<Sink> sink();
+// Flushes the current sink; programs call it as they end.
+void flush();
 
 // Whether the current sink wants lines of this priority; write and printf
 // ask it themselves.

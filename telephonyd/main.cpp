@@ -61,8 +61,8 @@ int main(int argc, char** argv) {
   }
   const ServiceOptions& options = parsed.options;
   if (options.logToStandardError) {
-    log::setSink(std::make_shared<log::TeeSink>(std::vector<std::shared_ptr<log::Sink>>{
-        std::make_shared<log::SyslogSink>(), std::make_shared<log::StderrSink>()}));
+    log::setSink(std::make_shared<log::TeeSink>(
+        std::vector<std::shared_ptr<log::Sink>>{log::makeSystemLogSink(), std::make_shared<log::StderrSink>()}));
   }
 
   std::string error;
@@ -108,5 +108,7 @@ int main(int argc, char** argv) {
               static_cast<unsigned long long>(options.seed), pace.c_str());
   const int status = QCoreApplication::exec();
   service.stop();
+  // Repeats of the last line, counted but not yet written.
+  log::flush();
   return status;
 }
