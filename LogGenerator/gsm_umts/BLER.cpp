@@ -25,11 +25,11 @@ void BLER::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logC
   const auto packet = acceptPacket("BLER", data, logCode, kCode, kMinimumLength);
   if (!packet) return;
   RowWriter rows(*this);
-  writeRows(rows, kRows, *packet);
+  writeRows<kRows>(rows, *packet);
   // The channels are the value of one row, replaced whole (not a section list).
   setRow("Transport Channels", Value(rowsOfEntries(*packet, channels(*packet), kChannels.entrySize, [&](std::size_t channel) {
            RowWriter row = kChannelRow.makeRow();
-           writeRows(row, kChannelRows, *packet, channel);
+           writeRows<kChannelRows>(row, *packet, channel);
            return row.value();
          })));
 }

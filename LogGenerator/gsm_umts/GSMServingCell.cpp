@@ -40,13 +40,13 @@ void GSMServingCell::updateWithData(std::span<const std::uint8_t> data, std::uin
   const PacketView packet(data);
   switch (logCode) {
     case gsm_cell_identity::kCode:
-      writeRecordRows(*this, kIdentityRows, packet, gsm_cell_identity::kMinimumLength);
+      writeRecordRows<kIdentityRows>(*this, packet, gsm_cell_identity::kMinimumLength);
       return;
     case gsm_cell_measurement::kCode:
-      writeRecordRows(*this, kMeasurementRows, packet, gsm_cell_measurement::kMinimumLength);
+      writeRecordRows<kMeasurementRows>(*this, packet, gsm_cell_measurement::kMinimumLength);
       return;
     case dedicated_allocation::kCode:
-      writeRecordRows(*this, kDedicatedAllocationRows, packet, dedicated_allocation::kMinimumLength);
+      writeRecordRows<kDedicatedAllocationRows>(*this, packet, dedicated_allocation::kMinimumLength);
       return;
     case kExtraCodeCellList: updateFromCellList(data); return;
     default: logUnknownCode(logCode); return;

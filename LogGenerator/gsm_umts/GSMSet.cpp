@@ -25,8 +25,8 @@ void GSMSet::updateWithData(std::span<const std::uint8_t> data, std::uint32_t lo
   if (gsmCells.count() == 0) return;
   list.install(rowsOfEntries(*packet, gsmCells, kGsmCells.entrySize, [&](std::size_t cell) {
     RowWriter row = kCellRow.makeRow();
-    writeRows(row, kCellRows, *packet, cell);
-    writeSignedRows(row, kCellSignedRows, *packet, cell);
+    writeRows<kCellRows>(row, *packet, cell);
+    writeSignedRows<kCellSignedRows>(row, *packet, cell);
     return row.value();
   }));
 }

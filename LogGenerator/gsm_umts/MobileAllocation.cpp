@@ -19,7 +19,7 @@ void MobileAllocation::updateWithData(std::span<const std::uint8_t> data, std::u
   const auto packet = acceptPacket("MobileAllocation", data, logCode, kCode, kMinimumLength);
   if (!packet) return;
   RowWriter rows(*this);
-  writeRows(rows, kRows, *packet);
+  writeRows<kRows>(rows, *packet);
   // The row's value is a list of its own, replaced whole.
   const Array texts = rowsOfEntries(*packet, arfcns(*packet), kArfcns.entrySize, [&](std::size_t entry) {
     return Value(std::string(fieldText(kArfcn, *packet, entry).view()));

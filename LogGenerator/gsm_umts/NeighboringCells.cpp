@@ -87,8 +87,8 @@ void NeighboringCells::updateFromMeasurement(const PacketView& packet) const {
     const std::uint32_t arfcn = gsm_cell_measurement::kNeighborArfcn.raw(packet, cell);
     const int bsic = bsicOf(arfcn);
     RowWriter row = (bsic < 0 ? kNeighborRow : kNeighborRowWithBsic).makeRow();
-    writeRows(row, kNeighborRows, packet, cell);
-    writeSignedRows(row, kNeighborSignedRows, packet, cell);
+    writeRows<kNeighborRows>(row, packet, cell);
+    writeSignedRows<kNeighborSignedRows>(row, packet, cell);
     if (bsic >= 0) row.set("BSIC", decimalText(bsic));
     return row.value();
   }));

@@ -5,17 +5,18 @@
 // without a message and the rows keep their values.
 
 #include <cstddef>
-#include <span>
 
 #include "LogGenerator/logcode/Rows.h"
 
 namespace corvane {
 
-inline void writeRecordRows(const Base& section, std::span<const RowField> table, const PacketView& packet,
-                            std::size_t minimumLength) {
+//
+//   writeRecordRows<kRows>(*this, packet, layout::kMinimumLength);
+template <const auto& Table>
+void writeRecordRows(const Base& section, const PacketView& packet, std::size_t minimumLength) {
   if (packet.size() < minimumLength) return;
   RowWriter rows(section);
-  writeRows(rows, table, packet);
+  writeRows<Table>(rows, packet);
 }
 
 }  // namespace corvane

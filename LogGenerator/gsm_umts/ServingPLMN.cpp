@@ -60,7 +60,7 @@ void ServingPLMN::updateFromRegistration(const PacketView& packet) const {
   // The baseband passes the location area code on high byte first.
   rows.set("Location Area Code", decimalText(registration::kLocationAreaCodeHigh.raw(packet) << 8 |
                                              registration::kLocationAreaCodeLow.raw(packet)));
-  writeRows(rows, kRegistrationRowsAfterCodes, packet);
+  writeRows<kRegistrationRowsAfterCodes>(rows, packet);
 }
 
 void ServingPLMN::updateFromCellList(std::span<const std::uint8_t> data) const {

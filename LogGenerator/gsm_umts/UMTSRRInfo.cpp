@@ -44,10 +44,10 @@ void UMTSRRInfo::updateWithData(std::span<const std::uint8_t> data, std::uint32_
   log::write(log::kWarning, "UMTSRRInfo");
   const PacketView packet(data);
   switch (logCode) {
-    case rrc_state::kCode: writeRecordRows(*this, kRrcStateRows, packet, rrc_state::kMinimumLength); return;
+    case rrc_state::kCode: writeRecordRows<kRrcStateRows>(*this, packet, rrc_state::kMinimumLength); return;
     case transmit_power::kCode: updateFromTransmitPower(packet); return;
     case umts_cell::kCode: updateFromCell(packet); return;
-    case ciphering::kCode: writeRecordRows(*this, kCipheringRows, packet, ciphering::kMinimumLength); return;
+    case ciphering::kCode: writeRecordRows<kCipheringRows>(*this, packet, ciphering::kMinimumLength); return;
     case kExtraCodeCellList: updateFromCellList(data); return;
     default: logUnknownCode(logCode); return;
   }
@@ -72,11 +72,11 @@ void UMTSRRInfo::updateFromTransmitPower(const PacketView& packet) const {
 void UMTSRRInfo::updateFromCell(const PacketView& packet) const {
   if (packet.size() < umts_cell::kMinimumLength) return;
   RowWriter rows(*this);
-  writeRows(rows, kCellRowsBeforeUarfcn, packet);
+  writeRows<kCellRowsBeforeUarfcn>(rows, packet);
   // A UARFCN comes only with the cell-monitor list, where it repeats the
   // downlink frequency; a fresh baseband record of the cell drops it.
   rows.remove("UARFCN");
-  writeRows(rows, kCellRowsAfterUarfcn, packet);
+  writeRows<kCellRowsAfterUarfcn>(rows, packet);
 }
 
 void UMTSRRInfo::updateFromCellList(std::span<const std::uint8_t> data) const {

@@ -60,8 +60,8 @@ void UMTSSet::updateFromRankedCells(const PacketView& packet) const {
   if (umtsCells.count() == 0) return;
   list.install(rowsOfEntries(packet, umtsCells, kUmtsCells.entrySize, [&](std::size_t cell) {
     RowWriter row = kCellRow.makeRow();
-    writeRows(row, kCellRows, packet, cell);
-    writeSignedRows(row, kCellSignedRows, packet, cell);
+    writeRows<kCellRows>(row, packet, cell);
+    writeSignedRows<kCellSignedRows>(row, packet, cell);
     row.set("Energy Per Chip", sixDecimalsText(kEcNo.value(packet, cell), kEcNo.field.conversion.unit));
     return row.value();
   }));

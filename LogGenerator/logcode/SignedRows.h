@@ -4,12 +4,13 @@
 // form as the rows of Rows.h,
 //
 //   constexpr SignedRowField kRows[] = {{"RSSI", layout::kRssi}, ...};
-//   writeSignedRows(rows, kRows, packet, entry);
+//   writeSignedRows<kRows>(rows, packet, entry);
 
 #include <cstddef>
 #include <cstdint>
-#include <span>
+#include <iterator>
 #include <string_view>
+#include <utility>
 
 #include "LogGenerator/logcode/DisplayText.h"
 #include "LogGenerator/logcode/Rows.h"
@@ -41,11 +42,18 @@ struct SignedRowField {
   records::SignedField field;
 };
 
-// Each row of the table, in order, from the packet (in the list entry that
-// begins `entry` bytes in).
-inline void writeSignedRows(RowWriter& rows, std::span<const SignedRowField> table, const PacketView& packet,
-                            std::size_t entry = 0) {
-  for (const SignedRowField& row : table) rows.set(row.key, signedFieldText(row.field, packet, entry));
+namespace signed_rows_detail {
+template <const auto& Table, std::size_t... I>
+inline void writeEach(RowWriter& rows, const PacketView& packet, std::size_t entry, std::index_sequence<I...>) {
+  (rows.set(Table[I].key, signedFieldText(Table[I].field, packet, entry)), ...);
+}
+}  // namespace signed_rows_detail
+
+// Each row of a constant table, in order, from the packet (in the list entry
+// that begins `entry` bytes in), written out row by row as writeRows<Table>.
+template <const auto& Table>
+inline void writeSignedRows(RowWriter& rows, const PacketView& packet, std::size_t entry = 0) {
+  signed_rows_detail::writeEach<Table>(rows, packet, entry, std::make_index_sequence<std::size(Table)>());
 }
 
 }  // namespace corvane
