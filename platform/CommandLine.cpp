@@ -33,11 +33,12 @@ ParsedCommandLine parseCommandLine(int argc, char** argv, std::span<const Comman
   for (std::size_t i = 0; i < options.size(); ++i) {
     const CommandLineOption& o = options[i];
     const int code = o.letter ? o.letter : kFirstLongOnlyCode + static_cast<int>(i);
-    table.push_back({o.name, o.takesValue ? required_argument : no_argument, nullptr, code});
+    table.push_back({o.name, o.takesValue ? (o.valueOptional ? optional_argument : required_argument) : no_argument,
+                     nullptr, code});
     codes.push_back(code);
     if (o.letter) {
       letters += o.letter;
-      if (o.takesValue) letters += ':';
+      if (o.takesValue) letters += o.valueOptional ? "::" : ":";
     }
   }
   table.push_back({"help", no_argument, nullptr, 'h'});

@@ -20,6 +20,10 @@ struct CommandLineOption {
   const char* name;        // the long form, without "--"
   char letter = 0;         // the short form; 0 for none
   bool takesValue = false;
+  // With takesValue: the value may be left out ("--log" or "--log=stderr";
+  // a value left out is passed as nullptr). It is then given only with "=",
+  // or right behind the letter.
+  bool valueOptional = false;
 };
 
 // How a program presents itself on the command line.

@@ -38,20 +38,26 @@ bool isText(std::span<const std::uint8_t> contents) {
 
 std::optional<Bytes> parseHexLine(std::string_view line, std::string& reason) {
   Bytes out;
+  if (!parseHexLineInto(line, out, reason)) return std::nullopt;
+  return out;
+}
+
+bool parseHexLineInto(std::string_view line, Bytes& out, std::string& reason) {
+  out.clear();
   int pending = -1;  // the high nibble of a byte being read
   for (std::size_t i = 0; i < line.size(); ++i) {
     const char c = line[i];
     if (isSeparator(c)) {
       if (pending >= 0) {
         reason = "separator inside a byte at column " + std::to_string(i + 1);
-        return std::nullopt;
+        return false;
       }
       continue;
     }
     const int d = hexDigit(c);
     if (d < 0) {
       reason = "'" + std::string(1, c) + "' is not a hex digit (column " + std::to_string(i + 1) + ")";
-      return std::nullopt;
+      return false;
     }
     if (pending < 0) {
       pending = d;
@@ -62,9 +68,9 @@ std::optional<Bytes> parseHexLine(std::string_view line, std::string& reason) {
   }
   if (pending >= 0) {
     reason = "odd number of hex digits";
-    return std::nullopt;
+    return false;
   }
-  return out;
+  return true;
 }
 
 InputFormat detectInputFormat(std::span<const std::uint8_t> contents) {

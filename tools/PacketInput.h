@@ -58,7 +58,7 @@ struct PacketList {
   std::vector<std::string> warnings;  // one line each, naming the source and where in it
 };
 
-enum class InputFormat { PropertyList, Snapshot, Dlf, HexText };
+enum class InputFormat { PropertyList, Snapshot, Dlf, HexText, Framed };
 
 InputFormat detectInputFormat(std::span<const std::uint8_t> contents);
 
@@ -78,6 +78,8 @@ std::optional<PacketList> packetsFromSnapshotContents(std::span<const std::uint8
 
 // Parses one line of hex text; nullopt with a reason for a bad line.
 std::optional<Bytes> parseHexLine(std::string_view line, std::string& reason);
+// The same into a buffer that is reused from line to line; false with a reason.
+bool parseHexLineInto(std::string_view line, Bytes& out, std::string& reason);
 
 // Reads a whole file ("-" is standard input).
 std::optional<Bytes> readInput(const std::string& path, InputError& error);

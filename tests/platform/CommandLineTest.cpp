@@ -96,3 +96,29 @@ TEST(CommandLineTest, HelpIsTheUsageThenTheDetails) {
 
 }  // namespace
 }  // namespace corvane
+
+namespace corvane {
+namespace {
+
+TEST(CommandLineTest, AnOptionalValueIsGivenWithAnEqualsSignOrLeftOut) {
+  constexpr CommandLineOption kWithOptional[] = {{"log", 'l', true, true}};
+  std::vector<std::string> arguments{"program", "--log", "--log=stderr", "-lsyslog", "file"};
+  std::vector<char*> argv;
+  for (auto& a : arguments) argv.push_back(a.data());
+  argv.push_back(nullptr);
+  std::vector<std::string> seen;
+  const ParsedCommandLine parsed = parseCommandLine(
+      static_cast<int>(arguments.size()), argv.data(), kWithOptional,
+      [&](std::string_view name, const char* value) {
+        seen.push_back(std::string(name) + (value ? "=" + std::string(value) : ""));
+        return std::string();
+      },
+      true);
+  EXPECT_EQ(parsed.request, ParsedCommandLine::Request::Run);
+  EXPECT_EQ(seen, (std::vector<std::string>{"log", "log=stderr", "log=syslog"}));
+  // A value that stands apart is an operand, not the option's value.
+  EXPECT_EQ(parsed.operands, std::vector<std::string>{"file"});
+}
+
+}  // namespace
+}  // namespace corvane

@@ -39,7 +39,7 @@ TEST(DecodeTool, JsonOfAnXmlPacketIsTheFoldedTree) {
       {"Neighbours", A({S("header"), D({{"ARFCN", S("70")}, {"RxLev", S("-80")}}), S("z")})},
   })));
   test::TemporaryDirectory dir;
-  const auto r = runProcess({kDecode, "--technology", "IFX", "--format", "json", dir.write("p.plist", packet)});
+  const auto r = runProcess({kDecode, "-q", "--technology", "IFX", "--format", "json", dir.write("p.plist", packet)});
   ASSERT_EQ(r.exitCode, 0) << r.err;
   EXPECT_EQ(r.err, "");
   const auto expected = nlohmann::ordered_json::parse(R"({"name": "Corvane", "children": [
@@ -82,10 +82,11 @@ TEST(DecodeTool, ADashReadsStandardInput) {
   EXPECT_EQ(r.out, "Corvane\n  Serving: 62\n");
 }
 
-TEST(DecodeTool, NoPacketsShowsTheEmptyState) {
-  const auto r = runProcess({kDecode, "-t", "IFX"}, "# nothing yet\n");
+TEST(DecodeTool, NoPacketsShowsTheEmptyStateAndSaysSo) {
+  const auto r = runProcess({kDecode, "-q", "-t", "IFX"}, "# nothing yet\n");
   ASSERT_EQ(r.exitCode, 0) << r.err;
   EXPECT_EQ(r.out, "Corvane: (unknown)\n");
+  EXPECT_EQ(r.err, "corvane-decode: warning: standard input: holds no packets\n");
 }
 
 TEST(DecodeTool, ANumberEndsItWithTheAssertionMessage) {
@@ -106,19 +107,34 @@ TEST(DecodeTool, AHexPacketThatIsNoPropertyListEndsItWithTheDeserializeAssertion
   EXPECT_NE(r.err.find("Could not deserialize the object"), std::string::npos) << r.err;
 }
 
-TEST(DecodeTool, LogWritesTheDecodersLinesToStandardError) {
-  const auto r = runProcess({kDecode, "-t", "IFX", "--log", kSample});
+TEST(DecodeTool, LogToStandardErrorWritesTheDecodersLinesThere) {
+  const auto r = runProcess({kDecode, "-q", "-t", "IFX", "--log=stderr", kSample});
   ASSERT_EQ(r.exitCode, 0) << r.err;
   EXPECT_EQ(r.err.rfind("<4> Creating Log object: 0x", 0), 0u) << r.err;
-  const auto quiet = runProcess({kDecode, "-t", "IFX", kSample});
+  // Without --log no decoder line is made; the summary is corvane-decode's own.
+  const auto plain = runProcess({kDecode, "-t", "IFX", kSample});
+  EXPECT_EQ(plain.err.find("<"), std::string::npos) << plain.err;
+  EXPECT_EQ(plain.err.rfind("corvane-decode: " + kSample + ": 1 packets from ", 0), 0u) << plain.err;
+  const auto quiet = runProcess({kDecode, "-q", "-t", "IFX", kSample});
   EXPECT_EQ(quiet.err, "");
+  // To the system log: nothing on standard error.
+  const auto syslog = runProcess({kDecode, "-q", "-t", "IFX", "--log", kSample});
+  EXPECT_EQ(syslog.exitCode, 0);
+  EXPECT_EQ(syslog.err, "");
+  const auto bad = runProcess({kDecode, "-t", "IFX", "--log=printer", kSample});
+  EXPECT_EQ(bad.exitCode, 2);
+  EXPECT_EQ(bad.err.rfind("corvane-decode: unknown log destination \"printer\" (syslog or stderr)\n", 0), 0u)
+      << bad.err;
 }
 
-TEST(DecodeTool, ABadHexLineNamesItsLineNumberAndExitsWithOne) {
-  const auto r = runProcess({kDecode, "-t", "IFX"}, "01 02\n\n0x03\n");
+TEST(DecodeTool, ABadHexLineNamesItsLineNumberAndExitsWithOneAfterTheLinesBeforeIt) {
+  const std::string hex = hexLine(test::xmlBytes(D({{"Serving", S("62")}}))) + "\n\n0x03\n";
+  const auto r = runProcess({kDecode, "-q", "-t", "IFX"}, hex);
   EXPECT_EQ(r.exitCode, 1);
-  EXPECT_EQ(r.out, "");
-  EXPECT_EQ(r.err, "corvane-decode: standard input:3: bad hex line: 'x' is not a hex digit (column 2)\n");
+  EXPECT_EQ(r.out, "Corvane\n  Serving: 62\n");
+  EXPECT_EQ(r.err,
+            "corvane-decode: standard input:3: bad hex line: 'x' is not a hex digit (column 2); the lines before it "
+            "were decoded\n");
 }
 
 TEST(DecodeTool, AnUnreadableFileExitsWithOne) {
@@ -143,7 +159,7 @@ TEST(DecodeTool, ADlfFileIsReplayedThroughTheLogCodeGenerator) {
   const Bytes dlf =
       test::dlfOfIntervals({{simFilesPacket("89001010000000000018")}, {simFilesPacket("89001012345678901234")}});
   test::TemporaryDirectory dir;
-  const auto r = runProcess({kDecode, "-t", "Quendra_LTE", dir.write("capture", asText(dlf))});
+  const auto r = runProcess({kDecode, "-q", "-t", "Quendra_LTE", dir.write("capture", asText(dlf))});
   ASSERT_EQ(r.exitCode, 0) << r.err;
   EXPECT_EQ(r.err, "");
   EXPECT_NE(r.out.find("\n  SIM Info\n    EF-ICCID: 89001012345678901234\n"), std::string::npos) << r.out;
@@ -178,20 +194,23 @@ TEST(DecodeTool, ATruncatedDlfIsReadUpToItsLastWholeRecordWithAWarning) {
   dlf.insert(dlf.end(), next.begin(), next.begin() + 20);
   test::TemporaryDirectory dir;
   const std::string file = dir.write("cut.dlf", asText(dlf));
-  const auto r = runProcess({kDecode, "-t", "Quendra_LTE", file});
+  const auto r = runProcess({kDecode, "-q", "-t", "Quendra_LTE", file});
   ASSERT_EQ(r.exitCode, 0) << r.err;
   EXPECT_EQ(r.err, "corvane-decode: warning: " + file + ": truncated record at offset " + std::to_string(cutAt) +
                        "; its 20 bytes are left out\n");
   EXPECT_NE(r.out.find("EF-ICCID: 89001012345678901234\n"), std::string::npos) << r.out;
 }
 
-TEST(DecodeTool, BinaryThatIsNoDlfExitsWithOne) {
+TEST(DecodeTool, BinaryThatIsNoCaptureExitsWithOneNamingWhatWasTried) {
   test::TemporaryDirectory dir;
   const std::string file = dir.write("random.bin", std::string("\x00\x00\x17\xFF\x80", 5));
   const auto r = runProcess({kDecode, "-t", "Quendra_LTE", file});
   EXPECT_EQ(r.exitCode, 1);
   EXPECT_EQ(r.out, "");
-  EXPECT_EQ(r.err, "corvane-decode: " + file + ": not a DLF file: no whole log record at offset 0\n");
+  EXPECT_EQ(r.err, "corvane-decode: " + file +
+                       ": not a capture corvane-decode reads: not a DLF (no run of log records from byte 0), not a "
+                       "framed stream (more bad frames than good ones), not a property list or snapshot, not hex "
+                       "text; if it is one of them, say which with --input-format\n");
 }
 
 TEST(DecodeTool, BadUsageExitsWithTwo) {

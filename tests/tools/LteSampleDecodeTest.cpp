@@ -51,7 +51,7 @@ void collectValues(const Json& node, const std::string& path, std::vector<std::p
 class LteSampleDecode : public ::testing::Test {
  protected:
   void SetUp() override {
-    const auto r = test::runProcess({kDecode, "--technology", "Quendra_LTE", "--format", "json", kSample});
+    const auto r = test::runProcess({kDecode, "-q", "--technology", "Quendra_LTE", "--format", "json", kSample});
     ASSERT_EQ(r.exitCode, 0) << r.err;
     ASSERT_EQ(r.err, "");
     // The class indexes' teardown lines may follow the document on standard output.
