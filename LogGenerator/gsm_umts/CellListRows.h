@@ -98,4 +98,30 @@ inline Array rowsOfCells(const Array& cells, std::string_view technology, std::s
   return Array(std::move(rows));
 }
 
+// Sets the rows of the table from the first serving cell of one of the
+// technologies; a record without a list or without such a cell changes nothing.
+inline void writeServingCellRows(const Base& section, std::span<const std::uint8_t> data,
+                                 std::initializer_list<std::string_view> technologies,
+                                 std::span<const CellListRow> table) {
+  const CellInfoArray list(data);
+  const Array* cells = cellsOf(list);
+  if (!cells) return;
+  const Dictionary* serving = firstCell(*cells, technologies, CellMonitorCellTypeServing);
+  if (!serving) return;
+  RowWriter rows(section);
+  writeCellRows(rows, *serving, table);
+}
+
+// Lists the neighbour cells of the technology, one row dictionary each, in
+// place of the section's list. The list is emptied first, so a record whose
+// list does not parse leaves it empty.
+inline void installNeighborRows(const Base& section, std::span<const std::uint8_t> data,
+                                std::string_view technology, std::span<const CellListRow> table) {
+  const CellInfoArray list(data);
+  const SectionList rows(section);
+  const Array* cells = cellsOf(list);
+  if (!cells) return;
+  rows.install(rowsOfCells(*cells, technology, CellMonitorCellTypeNeighbor, table));
+}
+
 }  // namespace corvane::cell_list

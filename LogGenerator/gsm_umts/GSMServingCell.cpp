@@ -48,21 +48,12 @@ void GSMServingCell::updateWithData(std::span<const std::uint8_t> data, std::uin
     case dedicated_allocation::kCode:
       writeRecordRows<kDedicatedAllocationRows>(*this, packet, dedicated_allocation::kMinimumLength);
       return;
-    case kExtraCodeCellList: updateFromCellList(data); return;
+    case kExtraCodeCellList:
+      // A UMTS serving cell is not a GSM serving cell.
+      cell_list::writeServingCellRows(*this, data, {CellMonitorRadioAccessTechnologyGSM}, kCellListRows);
+      return;
     default: logUnknownCode(logCode); return;
   }
-}
-
-void GSMServingCell::updateFromCellList(std::span<const std::uint8_t> data) const {
-  const CellInfoArray cellList(data);
-  const Array* cells = cell_list::cellsOf(cellList);
-  if (!cells) return;
-  // A UMTS serving cell is not a GSM serving cell.
-  const Dictionary* serving =
-      cell_list::firstCell(*cells, {CellMonitorRadioAccessTechnologyGSM}, CellMonitorCellTypeServing);
-  if (!serving) return;
-  RowWriter rows(*this);
-  cell_list::writeCellRows(rows, *serving, kCellListRows);
 }
 
 }  // namespace corvane

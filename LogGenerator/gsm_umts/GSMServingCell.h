@@ -12,9 +12,6 @@ namespace corvane {
 class GSMServingCell final : public Base {
  public:
   void updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) override;
-
- private:
-  void updateFromCellList(std::span<const std::uint8_t> data) const;
 };
 
 }  // namespace corvane

@@ -50,7 +50,9 @@ void NeighboringCells::updateWithData(std::span<const std::uint8_t> data, std::u
   switch (logCode) {
     case gsm_cell_measurement::kCode: updateFromMeasurement(packet); return;
     case arfcn_bsic::kCode: updateFromArfcnBsic(packet); return;
-    case kExtraCodeCellList: updateFromCellList(data); return;
+    case kExtraCodeCellList:
+      cell_list::installNeighborRows(*this, data, CellMonitorRadioAccessTechnologyGSM, kCellListRows);
+      return;
     default: logUnknownCode(logCode); return;
   }
 }
@@ -92,15 +94,6 @@ void NeighboringCells::updateFromMeasurement(const PacketView& packet) const {
     if (bsic >= 0) row.set("BSIC", decimalText(bsic));
     return row.value();
   }));
-}
-
-void NeighboringCells::updateFromCellList(std::span<const std::uint8_t> data) const {
-  const CellInfoArray cellList(data);
-  // Emptied first: a list that does not parse leaves the section empty.
-  const SectionList list(*this);
-  const Array* cells = cell_list::cellsOf(cellList);
-  if (!cells) return;
-  list.install(cell_list::rowsOfCells(*cells, CellMonitorRadioAccessTechnologyGSM, CellMonitorCellTypeNeighbor, kCellListRows));
 }
 
 }  // namespace corvane

@@ -26,7 +26,6 @@ class NeighboringCells final : public Base {
  private:
   void updateFromArfcnBsic(const PacketView& packet);
   void updateFromMeasurement(const PacketView& packet) const;
-  void updateFromCellList(std::span<const std::uint8_t> data) const;
   // The BSIC last given for the ARFCN, or -1.
   int bsicOf(std::uint32_t arfcn) const;
 

@@ -47,7 +47,10 @@ void ServingPLMN::updateWithData(std::span<const std::uint8_t> data, std::uint32
       }
       return;
     case registration::kCode: updateFromRegistration(packet); return;
-    case kExtraCodeCellList: updateFromCellList(data); return;
+    case kExtraCodeCellList:
+      cell_list::writeServingCellRows(
+          *this, data, {CellMonitorRadioAccessTechnologyUMTS, CellMonitorRadioAccessTechnologyGSM}, kCellListRows);
+      return;
     default: logUnknownCode(logCode); return;
   }
 }
@@ -61,17 +64,6 @@ void ServingPLMN::updateFromRegistration(const PacketView& packet) const {
   rows.set("Location Area Code", decimalText(registration::kLocationAreaCodeHigh.raw(packet) << 8 |
                                              registration::kLocationAreaCodeLow.raw(packet)));
   writeRows<kRegistrationRowsAfterCodes>(rows, packet);
-}
-
-void ServingPLMN::updateFromCellList(std::span<const std::uint8_t> data) const {
-  const CellInfoArray cellList(data);
-  const Array* cells = cell_list::cellsOf(cellList);
-  if (!cells) return;
-  const Dictionary* serving = cell_list::firstCell(
-      *cells, {CellMonitorRadioAccessTechnologyUMTS, CellMonitorRadioAccessTechnologyGSM}, CellMonitorCellTypeServing);
-  if (!serving) return;
-  RowWriter rows(*this);
-  cell_list::writeCellRows(rows, *serving, kCellListRows);
 }
 
 }  // namespace corvane

@@ -15,7 +15,6 @@ class ServingPLMN final : public Base {
 
  private:
   void updateFromRegistration(const PacketView& packet) const;
-  void updateFromCellList(std::span<const std::uint8_t> data) const;
 };
 
 }  // namespace corvane

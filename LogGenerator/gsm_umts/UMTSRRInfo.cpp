@@ -48,7 +48,9 @@ void UMTSRRInfo::updateWithData(std::span<const std::uint8_t> data, std::uint32_
     case transmit_power::kCode: updateFromTransmitPower(packet); return;
     case umts_cell::kCode: updateFromCell(packet); return;
     case ciphering::kCode: writeRecordRows<kCipheringRows>(*this, packet, ciphering::kMinimumLength); return;
-    case kExtraCodeCellList: updateFromCellList(data); return;
+    case kExtraCodeCellList:
+      cell_list::writeServingCellRows(*this, data, {CellMonitorRadioAccessTechnologyUMTS}, kCellListRows);
+      return;
     default: logUnknownCode(logCode); return;
   }
 }
@@ -77,17 +79,6 @@ void UMTSRRInfo::updateFromCell(const PacketView& packet) const {
   // downlink frequency; a fresh baseband record of the cell drops it.
   rows.remove("UARFCN");
   writeRows<kCellRowsAfterUarfcn>(rows, packet);
-}
-
-void UMTSRRInfo::updateFromCellList(std::span<const std::uint8_t> data) const {
-  const CellInfoArray cellList(data);
-  const Array* cells = cell_list::cellsOf(cellList);
-  if (!cells) return;
-  const Dictionary* serving =
-      cell_list::firstCell(*cells, {CellMonitorRadioAccessTechnologyUMTS}, CellMonitorCellTypeServing);
-  if (!serving) return;
-  RowWriter rows(*this);
-  cell_list::writeCellRows(rows, *serving, kCellListRows);
 }
 
 }  // namespace corvane

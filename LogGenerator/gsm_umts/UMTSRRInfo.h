@@ -20,7 +20,6 @@ class UMTSRRInfo final : public Base {
  private:
   void updateFromTransmitPower(const PacketView& packet) const;
   void updateFromCell(const PacketView& packet) const;
-  void updateFromCellList(std::span<const std::uint8_t> data) const;
 };
 
 }  // namespace corvane

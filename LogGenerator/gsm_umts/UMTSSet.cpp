@@ -48,7 +48,9 @@ void UMTSSet::updateWithData(std::span<const std::uint8_t> data, std::uint32_t l
   log::write(log::kWarning, "UMTSSet");
   switch (logCode) {
     case kCode: updateFromRankedCells(PacketView(data)); return;
-    case kExtraCodeCellList: updateFromCellList(data); return;
+    case kExtraCodeCellList:
+      cell_list::installNeighborRows(*this, data, CellMonitorRadioAccessTechnologyUMTS, kCellListRows);
+      return;
     default: logUnknownCode(logCode); return;
   }
 }
@@ -65,15 +67,6 @@ void UMTSSet::updateFromRankedCells(const PacketView& packet) const {
     row.set("Energy Per Chip", sixDecimalsText(kEcNo.value(packet, cell), kEcNo.field.conversion.unit));
     return row.value();
   }));
-}
-
-void UMTSSet::updateFromCellList(std::span<const std::uint8_t> data) const {
-  const CellInfoArray cellList(data);
-  // Emptied first: a list that does not parse leaves the section empty.
-  const SectionList list(*this);
-  const Array* cells = cell_list::cellsOf(cellList);
-  if (!cells) return;
-  list.install(cell_list::rowsOfCells(*cells, CellMonitorRadioAccessTechnologyUMTS, CellMonitorCellTypeNeighbor, kCellListRows));
 }
 
 }  // namespace corvane

@@ -20,7 +20,6 @@ class UMTSSet final : public Base {
 
  private:
   void updateFromRankedCells(const PacketView& packet) const;
-  void updateFromCellList(std::span<const std::uint8_t> data) const;
 };
 
 }  // namespace corvane

@@ -8,6 +8,7 @@
 #include "LogGenerator/gsm_umts/QND_GSMLogGenerator.h"
 #include "gsm_umts/GsmCellPackets.h"
 #include "gsm_umts/GsmUmtsSectionFixture.h"
+#include "support/GeneratorDisplay.h"
 
 namespace corvane {
 namespace {
@@ -17,55 +18,10 @@ using test::logPacket;
 using test::monitorCell;
 using test::put16;
 
-const Value* findSection(const Value& node, std::string_view name) {
-  if (const Dictionary* d = node.asDictionary()) {
-    for (const auto& [key, value] : d->entries()) {
-      if (key == name) return &value;
-      if (const Value* found = findSection(value, name)) return found;
-    }
-  }
-  return nullptr;
-}
-
-std::vector<std::string> sectionNames(const CodeDictionary::Subscribers* subscribers) {
-  std::vector<std::string> names;
-  if (subscribers) {
-    for (const auto& s : *subscribers) names.push_back(s->getSectionName());
-  }
-  return names;
-}
-
-std::vector<std::string> warningTexts(const log::ScopedCapture& capture) {
-  std::vector<std::string> texts;
-  for (const auto& line : capture.lines()) {
-    if (line.priority == log::kWarning) texts.push_back(line.text);
-  }
-  return texts;
-}
-
-class GsmUmtsDispatch : public ::testing::Test {
- protected:
-  GsmUmtsDispatch() {
-    log::ScopedCapture quiet;
-    generator = std::make_unique<QND_GSMLogGenerator>();
-    generator->getDisplayFromState(state);
-    display = state.get("Display");
-  }
-
-  std::string rowText(std::string_view section, std::string_view row) const {
-    const Value* rows = findSection(display, section);
-    const Value* v = rows && rows->asDictionary() ? rows->asDictionary()->find(row) : nullptr;
-    return v && v->asString() ? *v->asString() : "<none>";
-  }
-  std::size_t listSize(std::string_view section) const {
-    const Value* list = findSection(display, section);
-    return list && list->asArray() ? list->asArray()->size() : 9999;
-  }
-
-  std::unique_ptr<QND_GSMLogGenerator> generator;
-  Dictionary state;
-  Value display;
-};
+using GsmUmtsDispatch = test::GeneratorDisplayTest<QND_GSMLogGenerator>;
+using test::findSection;
+using test::sectionNames;
+using test::warningTexts;
 
 TEST(GsmUmtsClassIndex, SectionsSharingACodeAreCalledInTheOrderOfTheTable) {
   log::ScopedCapture quiet;

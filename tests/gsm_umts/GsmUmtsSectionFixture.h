@@ -1,10 +1,7 @@
 #pragma once
 
 // One GSM/UMTS section made and registered as its class index makes it, with
-// a container of its own; packets and cell lists laid out by hand. The row
-// readers are those of the LTE sections' tests.
-
-#include <gtest/gtest.h>
+// a container of its own; packets and cell lists laid out by hand.
 
 #include <initializer_list>
 #include <memory>
@@ -13,43 +10,21 @@
 
 #include "LogGenerator/gsm_umts/QND_GSMClassIndex.h"
 #include "LogGenerator/logcode/Base.h"
-#include "lte/LteSectionFixture.h"
 #include "platform/CellMonitor.h"
 #include "platform/Log.h"
 #include "support/Packets.h"
+#include "support/SectionFixture.h"
 #include "support/Values.h"
 
 namespace corvane::test {
 
 template <class Section>
-std::shared_ptr<Section> makeGsmUmtsSection(ClassDictionary& classDict, CodeDictionary& codeDict) {
-  return std::static_pointer_cast<Section>(
-      Base::initWithDict(*findSection<Section>(QND_GSMClassIndex::sections()), classDict, codeDict));
-}
+using GsmUmtsSectionTest = SectionTest<Section, &QND_GSMClassIndex::sections>;
 
 template <class Section>
-class GsmUmtsSectionTest : public ::testing::Test {
- protected:
-  GsmUmtsSectionTest() : section(makeGsmUmtsSection<Section>(classDict, codeDict)) {}
-
-  // Gives the section a dictionary of rows (as the display template does).
-  Dictionary attachRows() {
-    Dictionary rows;
-    section->updateSectionRef(Value(rows));
-    return rows;
-  }
-  // Gives the section an array of row dictionaries.
-  Array attachList() {
-    Array list;
-    section->updateSectionRef(Value(list));
-    return list;
-  }
-  void feed(const Bytes& packet, std::uint32_t code) { section->updateWithData(packet, code); }
-
-  ClassDictionary classDict;
-  CodeDictionary codeDict;
-  std::shared_ptr<Section> section;
-};
+std::shared_ptr<Section> makeGsmUmtsSection(ClassDictionary& classDict, CodeDictionary& codeDict) {
+  return makeSection<Section>(QND_GSMClassIndex::sections(), classDict, codeDict);
+}
 
 // A cell of the cell-monitor list: technology, type and numbers.
 inline Value monitorCell(std::string_view technology, std::string_view type,

@@ -9,6 +9,7 @@
 #include "LogGenerator/lte/LTELogGenerator.h"
 #include "LogGenerator/utran/UTRANLogGenerator.h"
 #include "platform/Log.h"
+#include "support/GeneratorDisplay.h"
 #include "support/Packets.h"
 #include "support/Values.h"
 
@@ -18,56 +19,9 @@ namespace {
 using test::logPacket;
 using test::put16;
 
-// The container of a section anywhere in the display.
-const Value* findSection(const Value& node, std::string_view name) {
-  if (const Dictionary* d = node.asDictionary()) {
-    for (const auto& [key, value] : d->entries()) {
-      if (key == name) return &value;
-      if (const Value* found = findSection(value, name)) return found;
-    }
-  }
-  return nullptr;
-}
-
-std::vector<std::string> sectionNames(const CodeDictionary::Subscribers* subscribers) {
-  std::vector<std::string> names;
-  if (subscribers) {
-    for (const auto& s : *subscribers) names.push_back(s->getSectionName());
-  }
-  return names;
-}
-
-std::vector<std::string> warningTexts(const log::ScopedCapture& capture) {
-  std::vector<std::string> texts;
-  for (const auto& line : capture.lines()) {
-    if (line.priority == log::kWarning) texts.push_back(line.text);
-  }
-  return texts;
-}
-
-class LteDispatch : public ::testing::Test {
- protected:
-  LteDispatch() {
-    log::ScopedCapture quiet;
-    generator = std::make_unique<LTELogGenerator>();
-    generator->getDisplayFromState(state);
-    display = state.get("Display");
-  }
-
-  std::string rowText(std::string_view section, std::string_view row) const {
-    const Value* rows = findSection(display, section);
-    const Value* v = rows && rows->asDictionary() ? rows->asDictionary()->find(row) : nullptr;
-    return v && v->asString() ? *v->asString() : "<none>";
-  }
-  std::size_t listSize(std::string_view section) const {
-    const Value* list = findSection(display, section);
-    return list && list->asArray() ? list->asArray()->size() : 9999;
-  }
-
-  std::unique_ptr<LTELogGenerator> generator;
-  Dictionary state;
-  Value display;
-};
+using LteDispatch = test::GeneratorDisplayTest<LTELogGenerator>;
+using test::sectionNames;
+using test::warningTexts;
 
 TEST(LteClassIndex, MakesTheElevenSectionsInTheOrderOfItsTable) {
   log::ScopedCapture quiet;

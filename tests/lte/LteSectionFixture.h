@@ -3,69 +3,17 @@
 // One LTE section made and registered as its class index makes it, with a
 // container of its own, and readers of what it wrote.
 
-#include <gtest/gtest.h>
-
-#include <memory>
-#include <string>
-#include <vector>
-
-#include "LogGenerator/logcode/Base.h"
 #include "LogGenerator/lte/LTEClassIndex.h"
-#include "platform/Log.h"
-#include "support/Packets.h"
+#include "support/SectionFixture.h"
 
 namespace corvane::test {
 
-// A section made from its row of the LTE table, registered in the two dictionaries.
 template <class Section>
 std::shared_ptr<Section> makeLteSection(ClassDictionary& classDict, CodeDictionary& codeDict) {
-  return std::static_pointer_cast<Section>(
-      Base::initWithDict(*findSection<Section>(LTEClassIndex::sections()), classDict, codeDict));
+  return makeSection<Section>(LTEClassIndex::sections(), classDict, codeDict);
 }
 
 template <class Section>
-class LteSectionTest : public ::testing::Test {
- protected:
-  LteSectionTest() : section(makeLteSection<Section>(classDict, codeDict)) {}
-
-  // Gives the section a dictionary of rows (as the display template does).
-  Dictionary attachRows() {
-    Dictionary rows;
-    section->updateSectionRef(Value(rows));
-    return rows;
-  }
-  // Gives the section an array of row dictionaries.
-  Array attachList() {
-    Array list;
-    section->updateSectionRef(Value(list));
-    return list;
-  }
-  void feed(const Bytes& packet, std::uint32_t code) { section->updateWithData(packet, code); }
-
-  ClassDictionary classDict;
-  CodeDictionary codeDict;
-  std::shared_ptr<Section> section;
-};
-
-// The text of a row, or "<none>" when the row is missing or not a string.
-inline std::string rowText(const Dictionary& rows, std::string_view key) {
-  const Value* v = rows.find(key);
-  const std::string* s = v ? v->asString() : nullptr;
-  return s ? *s : "<none>";
-}
-
-inline Dictionary rowAt(const Array& list, std::size_t i) { return *list.at(i).asDictionary(); }
-
-inline std::vector<std::string> keysOf(const Dictionary& rows) {
-  std::vector<std::string> keys;
-  for (const auto& entry : rows.entries()) keys.push_back(entry.first);
-  return keys;
-}
-
-inline std::vector<log::Line> warnings(std::initializer_list<const char*> texts) {
-  std::vector<log::Line> lines;
-  for (const char* t : texts) lines.push_back({log::kWarning, t});
-  return lines;
-}
+using LteSectionTest = SectionTest<Section, &LTEClassIndex::sections>;
 
 }  // namespace corvane::test
