@@ -8,6 +8,13 @@ namespace corvane {
 
 using namespace gsm_umts::cell_set;
 
+namespace {
+
+// What these sections install after every walk; never written to.
+const Array kNoRows;
+
+}  // namespace
+
 BoundedList CellSetLog::cells(const PacketView& packet) { return BoundedList(kCount.raw(packet), kCells); }
 
 BoundedList CellSetLog::energyBlocks(const PacketView& packet) {
@@ -30,7 +37,7 @@ void UnlistedCellSet::updateWithData(std::span<const std::uint8_t> data, std::ui
   if (cells.count() == 0) return;
   // Each cell's set type is read; whatever it is, no row.
   forEachEntry(*packet, cells, kCells.entrySize, [&](std::size_t cell) { (void)kSetType.raw(*packet, cell); });
-  list.install(Array());
+  list.install(kNoRows);
 }
 
 }  // namespace corvane

@@ -3,6 +3,7 @@
 #include <array>
 
 #include "LogGenerator/gsm_umts/CellListRows.h"
+#include "LogGenerator/gsm_umts/RecordRows.h"
 #include "LogGenerator/gsm_umts/records/PlmnSelectionModeRecord.h"
 #include "LogGenerator/gsm_umts/records/RegistrationRecord.h"
 
@@ -12,6 +13,7 @@ namespace {
 
 using namespace gsm_umts;
 
+constexpr RowField kSelectionModeRows[] = {{"PLMN Sel Mod", plmn_selection::kMode}};
 constexpr RowField kRegistrationRowsAfterCodes[] = {
     {"Routing Area Code", registration::kRoutingAreaCode},
     {"Service Type", registration::kServiceType},
@@ -42,9 +44,7 @@ void ServingPLMN::updateWithData(std::span<const std::uint8_t> data, std::uint32
   const PacketView packet(data);
   switch (logCode) {
     case plmn_selection::kCode:
-      if (packet.size() >= plmn_selection::kMinimumLength) {
-        RowWriter(*this).set("PLMN Sel Mod", fieldText(plmn_selection::kMode, packet));
-      }
+      writeRecordRows<kSelectionModeRows>(*this, packet, plmn_selection::kMinimumLength);
       return;
     case registration::kCode: updateFromRegistration(packet); return;
     case kExtraCodeCellList:
