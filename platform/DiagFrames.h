@@ -21,6 +21,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <cstring>
 #include <span>
 #include <vector>
 
@@ -88,6 +89,26 @@ class Deframer {
   FrameCounts counts_;
 };
 
+namespace detail {
+
+// The first flag or escape byte in [p, end), or end: eight bytes at a time.
+inline const std::uint8_t* findFlagOrEscape(const std::uint8_t* p, const std::uint8_t* end) {
+  constexpr std::uint64_t kOnes = 0x0101010101010101ULL;
+  constexpr std::uint64_t kHighs = 0x8080808080808080ULL;
+  // True when some byte of v is zero.
+  auto anyZeroByte = [](std::uint64_t v) { return ((v - kOnes) & ~v & kHighs) != 0; };
+  while (end - p >= 8) {
+    std::uint64_t word;
+    std::memcpy(&word, p, 8);
+    if (anyZeroByte(word ^ (kOnes * kFlag)) || anyZeroByte(word ^ (kOnes * kEscape))) break;
+    p += 8;
+  }
+  while (p < end && *p != kFlag && *p != kEscape) ++p;
+  return p;
+}
+
+}  // namespace detail
+
 template <class OnFrame>
 void Deframer::feed(std::span<const std::uint8_t> bytes, OnFrame&& onFrame) {
   const std::uint8_t* p = bytes.data();
@@ -96,7 +117,7 @@ void Deframer::feed(std::span<const std::uint8_t> bytes, OnFrame&& onFrame) {
   while (p < end) {
     // The bytes of the frame up to the next flag or escape, copied in one run.
     const std::uint8_t* run = p;
-    while (p < end && *p != kFlag && *p != kEscape) ++p;
+    p = detail::findFlagOrEscape(p, end);
     if (p > run) {
       std::size_t n = static_cast<std::size_t>(p - run);
       if (escaped_) {
@@ -112,7 +133,7 @@ void Deframer::feed(std::span<const std::uint8_t> bytes, OnFrame&& onFrame) {
         overflowed_ = true;
         n = room;
       }
-      for (std::size_t i = 0; i < n; ++i) buffer[size_ + i] = run[i];
+      if (n > 0) std::memcpy(buffer + size_, run, n);
       size_ += n;
     }
     if (p == end) break;
