@@ -3,6 +3,7 @@
 #include <stdexcept>
 
 #include "platform/LogChannelTechnology.h"
+#include "telephonyd/GsmUmtsRadioEncoder.h"
 #include "telephonyd/LogRecord.h"
 #include "telephonyd/LteRadioEncoder.h"
 
@@ -78,6 +79,7 @@ std::unique_ptr<LogCodeSimulator> makeLogCodeScenario(std::string_view technolog
   auto scenario = std::make_unique<LogCodeSimulator>(technology, seed, clockStart);
   scenario->addEncoder(std::make_unique<ExtraCodeEncoder>());
   if (technology == kLogChannelTechnologyQuendraLTE) scenario->addEncoder(std::make_unique<LteRadioEncoder>());
+  if (technology == kLogChannelTechnologyQuendraGSM) scenario->addEncoder(std::make_unique<GsmUmtsRadioEncoder>());
   return scenario;
 }
 

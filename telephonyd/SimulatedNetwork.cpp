@@ -16,9 +16,56 @@ constexpr int kHandoverMargin = 6;     // dB a neighbour must lead by ...
 constexpr int kHandoverSteps = 3;      // ... for this many steps in a row
 constexpr int kUnmeasuredOneIn = 20;   // chance of a neighbour going unmeasured in a step
 constexpr int kImsToggleOneIn = 60;    // chance per step that the IMS context comes or goes
-// Below this UMTS level the GSM/UMTS phone falls back to GSM; above the other it returns.
+// Below this UMTS level the fading GSM/UMTS phone falls back to GSM; above
+// the other the phone leaving GSM returns.
 constexpr int kUmtsFallbackLevel = -105;
 constexpr int kUmtsReturnLevel = -95;
+// dB per step by which the UMTS coverage fades and comes back; back in UMTS
+// idle it keeps coming back until the serving cell is at this level.
+constexpr int kUmtsFadeStep = 4;
+constexpr int kUmtsRecoveredLevel = -85;
+constexpr int kUmtsRecoverStep = 2;
+// The active set: a cell of the serving carrier within this many dB of the
+// serving cell joins it, one beyond the other leaves it; at most three cells.
+constexpr int kActiveSetAddWindow = 10;
+constexpr int kActiveSetDropWindow = 13;
+constexpr std::size_t kActiveSetSize = 3;
+
+// How long the timed phases of the journey last, in steps.
+struct PhaseLength {
+  SimulatedNetwork::Phase phase;
+  int least;
+  int most;
+};
+constexpr std::array<PhaseLength, 6> kPhaseLengths = {{
+    {SimulatedNetwork::Phase::UmtsIdle, 6, 10},
+    {SimulatedNetwork::Phase::UmtsConnecting, 1, 1},
+    {SimulatedNetwork::Phase::UmtsFach, 3, 5},
+    {SimulatedNetwork::Phase::UmtsDch, 8, 12},
+    {SimulatedNetwork::Phase::GsmIdle, 4, 6},
+    {SimulatedNetwork::Phase::GsmDedicated, 6, 10},
+}};
+
+// The phase that follows a timed one when its time is up; the fading and
+// leaving phases end with a reselection instead.
+struct PhaseSuccessor {
+  SimulatedNetwork::Phase phase;
+  SimulatedNetwork::Phase next;
+};
+constexpr std::array<PhaseSuccessor, 6> kPhaseSuccessors = {{
+    {SimulatedNetwork::Phase::UmtsIdle, SimulatedNetwork::Phase::UmtsConnecting},
+    {SimulatedNetwork::Phase::UmtsConnecting, SimulatedNetwork::Phase::UmtsFach},
+    {SimulatedNetwork::Phase::UmtsFach, SimulatedNetwork::Phase::UmtsDch},
+    {SimulatedNetwork::Phase::UmtsDch, SimulatedNetwork::Phase::UmtsFading},
+    {SimulatedNetwork::Phase::GsmIdle, SimulatedNetwork::Phase::GsmDedicated},
+    {SimulatedNetwork::Phase::GsmDedicated, SimulatedNetwork::Phase::GsmLeaving},
+}};
+
+// GSM 900 traffic channels: a mobile allocation of 3 to 5 of them.
+constexpr int kLowestGsmArfcn = 1;
+constexpr int kHighestGsmArfcn = 124;
+constexpr int kMobileAllocationLeast = 3;
+constexpr int kMobileAllocationMost = 5;
 
 // The LTE cell search finds a cell on the serving carrier every 4 to 25 steps,
 // unless two found cells are still only detected or five are about at once.
@@ -163,11 +210,15 @@ std::string number(long long value) { return std::to_string(value); }
 }  // namespace
 
 SimulatedNetwork::SimulatedNetwork(std::string_view technology, std::uint64_t seed)
-    : random_(seed), radio_(~seed), detection_(seed ^ 0x9E3779B97F4A7C15u) {
+    : random_(seed),
+      radio_(~seed),
+      detection_(seed ^ 0x9E3779B97F4A7C15u),
+      journey_(seed * 0x2545F4914F6CDD1Du + 0x632BE59BD9B4E019u) {
   const int areaCode = random_.uniform(0x1000, 0x7FFF);
   if (technology == kLogChannelTechnologyQuendraGSM) {
     addCells(Access::UMTS, 5, areaCode);
     addCells(Access::GSM, 4, areaCode);
+    journeys_ = true;
   } else if (technology == kLogChannelTechnologyQuendraUTRAN2) {
     addCells(Access::UTRAN2, 5, areaCode);
     addCells(Access::GSM, 3, areaCode);
@@ -203,6 +254,101 @@ SimulatedNetwork::SimulatedNetwork(std::string_view technology, std::uint64_t se
   routingAreaCode_ = random_.uniform(1, 254);
   internetAddress_ = "10." + number(random_.uniform(0, 255)) + "." + number(random_.uniform(0, 255)) + "." +
                      number(random_.uniform(1, 254));
+  if (journeys_) planGsmUmtsCells();
+}
+
+void SimulatedNetwork::planGsmUmtsCells() {
+  std::vector<int> broadcastChannels;
+  for (const Cell& cell : cells_) {
+    if (cell.access == Access::GSM) broadcastChannels.push_back(cell.channel);
+  }
+  for (Cell& cell : cells_) {
+    if (cell.access != Access::GSM) continue;
+    cell.code = journey_.uniform(0, 63);  // NCC and BCC
+    cell.hoppingSequence = journey_.uniform(1, 63);
+    // Traffic channels apart from every cell's broadcast channel.
+    const int count = journey_.uniform(kMobileAllocationLeast, kMobileAllocationMost);
+    while (static_cast<int>(cell.mobileAllocation.size()) < count) {
+      const int arfcn = journey_.uniform(kLowestGsmArfcn, kHighestGsmArfcn);
+      const auto taken = [arfcn](const std::vector<int>& channels) {
+        return std::find(channels.begin(), channels.end(), arfcn) != channels.end();
+      };
+      if (!taken(broadcastChannels) && !taken(cell.mobileAllocation)) cell.mobileAllocation.push_back(arfcn);
+    }
+    std::sort(cell.mobileAllocation.begin(), cell.mobileAllocation.end());
+  }
+  uraIdentity_ = journey_.uniform(1, 0xFFFF);
+  phase_ = Phase::UmtsIdle;
+  for (const PhaseLength& length : kPhaseLengths) {
+    if (length.phase == phase_) phaseStepsLeft_ = journey_.uniform(length.least, length.most);
+  }
+  updateActiveSet();
+}
+
+void SimulatedNetwork::enterPhase(Phase phase) {
+  phase_ = phase;
+  phaseStepsLeft_ = 0;
+  for (const PhaseLength& length : kPhaseLengths) {
+    if (length.phase == phase) phaseStepsLeft_ = journey_.uniform(length.least, length.most);
+  }
+  ++phaseChanges_;
+}
+
+void SimulatedNetwork::moveAlongJourney() {
+  // The UMTS coverage fades, comes back, and once back settles.
+  const int trend = phase_ == Phase::UmtsFading ? -kUmtsFadeStep
+                    : phase_ == Phase::GsmLeaving ? kUmtsFadeStep
+                    : phase_ == Phase::UmtsIdle && cells_[serving_].level < kUmtsRecoveredLevel ? kUmtsRecoverStep
+                                                                                                : 0;
+  if (trend != 0) {
+    const LevelRange range = levelRange(Access::UMTS);
+    for (Cell& cell : cells_) {
+      if (cell.access != Access::UMTS) continue;
+      cell.level = std::clamp(cell.level + trend, range.low, range.high);
+      cell.quality = std::clamp((cell.level + 60) / 4 - 2 + journey_.uniform(-1, 1), -24, 0);
+    }
+  }
+  if (phaseStepsLeft_ > 0 && --phaseStepsLeft_ == 0) {
+    for (const PhaseSuccessor& successor : kPhaseSuccessors) {
+      if (successor.phase == phase_) {
+        enterPhase(successor.next);
+        break;
+      }
+    }
+  }
+}
+
+void SimulatedNetwork::updateActiveSet() {
+  const Cell& serving = cells_[serving_];
+  std::vector<std::size_t> previous = std::move(activeSet_);
+  activeSet_.clear();
+  if (serving.access != Access::UMTS) return;
+  activeSet_.push_back(serving_);
+  if (phase_ != Phase::UmtsDch) return;
+  std::vector<std::size_t> others;
+  for (std::size_t i = 0; i < cells_.size(); ++i) {
+    const Cell& cell = cells_[i];
+    if (i == serving_ || cell.access != Access::UMTS || !cell.measured || cell.channel != serving.channel) continue;
+    const bool member = std::find(previous.begin(), previous.end(), i) != previous.end();
+    const int window = member ? kActiveSetDropWindow : kActiveSetAddWindow;
+    if (cell.level >= serving.level - window) others.push_back(i);
+  }
+  std::stable_sort(others.begin(), others.end(),
+                   [this](std::size_t a, std::size_t b) { return cells_[a].level > cells_[b].level; });
+  for (std::size_t i : others) {
+    if (activeSet_.size() == kActiveSetSize) break;
+    activeSet_.push_back(i);
+  }
+}
+
+std::vector<const SimulatedNetwork::Cell*> SimulatedNetwork::activeSet() const {
+  std::vector<const Cell*> cells;
+  for (std::size_t i : activeSet_) cells.push_back(&cells_[i]);
+  return cells;
+}
+
+int SimulatedNetwork::uraIdentity(const Cell& cell) const {
+  return (uraIdentity_ + cell.areaCode - cells_.front().areaCode) & 0xFFFF;
 }
 
 void SimulatedNetwork::addCells(Access access, int count, int areaCode) {
@@ -430,6 +576,7 @@ void SimulatedNetwork::step() {
   ++steps_;
   for (std::size_t i = 0; i < plannedCells_; ++i) drift(cells_[i]);
   if (cells_[serving_].access == Access::LTE) stepDetectedCells();
+  if (journeys_) moveAlongJourney();
   const Cell& serving = cells_[serving_];
   for (Cell& cell : cells_) {
     const bool clearlyStronger = !cell.serving && cell.measured && cell.access == serving.access &&
@@ -439,13 +586,20 @@ void SimulatedNetwork::step() {
   const std::size_t best = strongest(serving.access);
   if (best != serving_ && best < cells_.size() && cells_[best].strongerSteps >= kHandoverSteps) {
     changeServingCell(best);
-  } else if (serving.access == Access::UMTS && serving.level < kUmtsFallbackLevel) {
+  } else if (phase_ == Phase::UmtsFading && serving.level < kUmtsFallbackLevel) {
     const std::size_t gsm = strongest(Access::GSM);
-    if (gsm < cells_.size()) changeServingCell(gsm);
-  } else if (serving.access == Access::GSM) {
+    if (gsm < cells_.size()) {
+      changeServingCell(gsm);
+      enterPhase(Phase::GsmIdle);
+    }
+  } else if (phase_ == Phase::GsmLeaving) {
     const std::size_t umts = strongest(Access::UMTS);
-    if (umts < cells_.size() && cells_[umts].level > kUmtsReturnLevel) changeServingCell(umts);
+    if (umts < cells_.size() && cells_[umts].level > kUmtsReturnLevel) {
+      changeServingCell(umts);
+      enterPhase(Phase::UmtsIdle);
+    }
   }
+  if (journeys_) updateActiveSet();
 
   if (random_.oneIn(kImsToggleOneIn)) {
     imsActive_ = !imsActive_;

@@ -7,9 +7,8 @@
 //
 // The phone is registered on the test network 001-01. The cells are those of
 // the scenario's technology:
-//   Quendra_GSM     camped on UMTS (band 1), with UMTS and GSM 900 neighbours;
-//                   falls back to the strongest GSM cell when the UMTS level
-//                   collapses, and returns when UMTS is strong again
+//   Quendra_GSM     camped on UMTS (band 1), with UMTS and GSM 900 neighbours,
+//                   on a journey that takes it to GSM and back (below)
 //   Quendra_UTRAN2  camped on a UTRAN2 cell (band 34 or 39), with UTRAN2 and
 //                   GSM 900 neighbours
 //   Quendra_LTE     camped on LTE (band 3), with intra- and inter-frequency LTE
@@ -34,6 +33,28 @@
 // is either measured, an ordinary neighbour until it fades out again, or lost.
 // These cells stay below the serving cell, so they never take over; the cell
 // list holds them as it holds every neighbour, unmeasured while only detected.
+//
+// The GSM/UMTS phone moves through the same journey again and again, each
+// stay lasting some seconds that the seed draws:
+//   UMTS idle      camped, RRC disconnected; a UMTS coverage that had faded
+//                  comes back up here
+//   connecting     one step of RRC connection set-up
+//   CELL_FACH      a little data on the common channels
+//   CELL_DCH       a data session on a dedicated channel, with an active set
+//                  of the serving cell and up to two cells of its carrier
+//                  within reach of it (soft handover)
+//   fading         released to idle while the UMTS coverage fades, until the
+//                  serving level falls below -105 dBm and the phone reselects
+//                  to the strongest GSM cell
+//   GSM idle       camped on GSM
+//   GSM dedicated  a call on a hopping traffic channel: the serving cell's
+//                  mobile allocation and hopping sequence number
+//   leaving GSM    idle again while the UMTS coverage comes back, until a
+//                  UMTS cell is above -95 dBm and the phone reselects to it
+// GSM cells carry a BSIC and a mobile allocation; the network also has a
+// routing area and a UTRAN registration area (URA). The journey draws from a
+// random stream of its own, so the SIM and PDP contexts of a seed stay as
+// they were.
 //
 // Everything depends only on the technology, the seed and the number of steps.
 
@@ -61,11 +82,17 @@ class SimulatedNetwork {
     int cellId = 0;
     int channel = 0;    // ARFCN (GSM), UARFCN (UMTS, UTRAN2) or E-ARFCN (LTE)
     int band = 0;       // UMTS, UTRAN2 and LTE
-    int code = 0;       // scrambling code (UMTS), cell parameter id (UTRAN2), physical cell id (LTE)
+    int code = 0;       // scrambling code (UMTS), cell parameter id (UTRAN2), physical cell id (LTE),
+                        // BSIC (GSM, on the GSM/UMTS network)
     int level = 0;      // dBm: RSSI (GSM, LTE) or RSCP (UMTS, UTRAN2); GSM and LTE levels are even
     int quality = 0;    // Ec/N0 in dB (UMTS, UTRAN2)
     bool measured = true;
     int strongerSteps = 0;  // consecutive steps clearly above the serving cell
+
+    // GSM on the GSM/UMTS network: the traffic channels' hopping sequence
+    // number and mobile allocation (ARFCNs, ascending).
+    int hoppingSequence = 0;
+    std::vector<int> mobileAllocation;
 
     // LTE only. RSRP in dBm and RSRQ in dB move in half-dB steps, the finest
     // step that every LTE record carrying them can hold.
@@ -86,6 +113,9 @@ class SimulatedNetwork {
     int code = 0;                  // primary scrambling code (UMTS) or BSIC (GSM)
     int band = 0;                  // band 1 (UMTS); the band indicator 0, DCS 1800 (GSM)
   };
+
+  // Where the GSM/UMTS phone is in its journey; the phase of the other technologies' phones stays UmtsIdle.
+  enum class Phase { UmtsIdle, UmtsConnecting, UmtsFach, UmtsDch, UmtsFading, GsmIdle, GsmDedicated, GsmLeaving };
 
   // Throws std::invalid_argument for a technology that is not a log-code technology.
   SimulatedNetwork(std::string_view technology, std::uint64_t seed);
@@ -110,6 +140,15 @@ class SimulatedNetwork {
   std::uint64_t pdpGeneration() const { return pdpGeneration_; }
   const std::string& imsi() const { return imsi_; }
 
+  Phase phase() const { return phase_; }
+  // Counts the phase changes, so that a reporter sees when to report the state again.
+  std::uint64_t phaseChanges() const { return phaseChanges_; }
+  // The UMTS active set, serving cell first, the others strongest first; empty on GSM.
+  std::vector<const Cell*> activeSet() const;
+  int routingAreaCode() const { return routingAreaCode_; }
+  // The URA of a UMTS cell: one per location area.
+  int uraIdentity(const Cell& cell) const;
+
   static constexpr int kMobileCountryCode = 1;  // 001
   static constexpr int kMobileNetworkCode = 1;  // 01
 
@@ -122,6 +161,10 @@ class SimulatedNetwork {
   void changeServingCell(std::size_t to);
   std::size_t strongest(Access access) const;
   Dictionary cellFields(const Cell& cell) const;
+  void planGsmUmtsCells();
+  void enterPhase(Phase phase);
+  void moveAlongJourney();
+  void updateActiveSet();
 
   SeededRandom random_;
   // LTE's measurement noise and inter-RAT neighbours draw from a stream of
@@ -145,6 +188,15 @@ class SimulatedNetwork {
   std::vector<InterRatNeighbour> interRatNeighbours_;
   std::size_t serving_ = 0;
   std::uint64_t steps_ = 0;
+
+  // The GSM/UMTS phone's journey.
+  bool journeys_ = false;
+  SeededRandom journey_;
+  Phase phase_ = Phase::UmtsIdle;
+  int phaseStepsLeft_ = 0;  // of a timed phase
+  std::uint64_t phaseChanges_ = 0;
+  std::vector<std::size_t> activeSet_;  // indices into cells_
+  int uraIdentity_ = 0;
   std::uint64_t cellChanges_ = 0;
 
   // SIM

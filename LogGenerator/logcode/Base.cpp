@@ -1,8 +1,7 @@
 #include "LogGenerator/logcode/Base.h"
 
-#include <array>
-
 #include "LogGenerator/logcode/ArrayLock.h"
+#include "LogGenerator/records/EcIoTable.h"
 #include "platform/Assertion.h"
 #include "platform/Log.h"
 
@@ -44,23 +43,6 @@ class ArrayLockHolder {
   ArrayLockHolder(const ArrayLockHolder&) = delete;
   ArrayLockHolder& operator=(const ArrayLockHolder&) = delete;
 };
-
-struct EcnoStep {
-  std::uint32_t above;  // the row applies when the value is greater than this
-  std::int16_t decibels;
-};
-
-// Read from the top; the first row whose bound the value exceeds gives the
-// result. The table is kept as it stands: the last two steps both give -31,
-// and both the saturated top and the bottom give 0.
-constexpr std::array<EcnoStep, 32> kEcnoSteps = {{
-    {417647, -1}, {331808, -2}, {263624, -3}, {209463, -4}, {166441, -5}, {132268, -6}, {105123, -7},
-    {83562, -8},  {66435, -9},  {52830, -10}, {42023, -11}, {33440, -12}, {26621, -13}, {21205, -14},
-    {16903, -15}, {13486, -16}, {10771, -17}, {8615, -18},  {6902, -19},  {5542, -20},  {4461, -21},
-    {3603, -22},  {2921, -23},  {2240, -24},  {1949, -25},  {1607, -26},  {1336, -27},  {1120, -28},
-    {949, -29},   {813, -30},   {756, -31},   {705, -31},
-}};
-constexpr std::uint32_t kEcnoUnity = 524288;
 
 }  // namespace
 
@@ -118,13 +100,7 @@ void Base::replaceArray(const Array& target, const Array& source) {
   for (const auto& element : source.elements()) target.append(element);
 }
 
-std::int16_t Base::lookUpECNO(std::uint32_t value) {
-  if (value >= kEcnoUnity) return 0;
-  for (const auto& step : kEcnoSteps) {
-    if (value > step.above) return step.decibels;
-  }
-  return 0;
-}
+std::int16_t Base::lookUpECNO(std::uint32_t value) { return records::ecIoDecibels(value); }
 
 std::optional<Dictionary> Base::sectionDictionary() const {
   if (const auto* weak = std::get_if<Dictionary::Weak>(&sectionRef)) return weak->lock();

@@ -61,7 +61,8 @@ TEST(LogCodeSimulatorTest, PeriodZeroReportsSimFilesCellListAndPdpContextsAtTheC
 }
 
 TEST(LogCodeSimulatorTest, EveryPacketIsAWellFramedExtraCodeRecordWithItsCode) {
-  for (const SourcePacket& packet : firstPackets(kLogChannelTechnologyQuendraGSM, 8, 300)) {
+  // Quendra_UTRAN2's scenario sends the extra codes alone.
+  for (const SourcePacket& packet : firstPackets(kLogChannelTechnologyQuendraUTRAN2, 8, 300)) {
     const Record record = recordOf(*packet.data);
     EXPECT_EQ(record.type, kLogTypeExtraCode);
     EXPECT_EQ(record.length, packet.data->size() - 1);
@@ -134,7 +135,7 @@ TEST(LogCodeSimulatorTest, SameSeedAndStartGiveTheSameBytesAndAnotherSeedOthers)
 
 TEST(LogCodeSimulatorTest, CellListsDriftFromOneReportToTheNext) {
   std::vector<Bytes> payloads;
-  for (const SourcePacket& packet : firstPackets(kLogChannelTechnologyQuendraGSM, 6, 100)) {
+  for (const SourcePacket& packet : firstPackets(kLogChannelTechnologyQuendraUTRAN2, 6, 100)) {
     if (*packet.code == kExtraCodeBase + 1) payloads.push_back(recordOf(*packet.data).payload);
   }
   ASSERT_GT(payloads.size(), 50u);

@@ -1,0 +1,523 @@
+// The Quendra_GSM scenario's radio records, read by the GSM/UMTS decoder
+// itself: the phone's journey from UMTS idle through FACH and DCH to GSM and
+// back, every record agreeing with the cell list and with the simulated
+// network as it moves.
+
+#include "telephonyd/GsmUmtsRadioEncoder.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cstdio>
+#include <cstdlib>
+#include <fstream>
+#include <map>
+#include <optional>
+#include <set>
+#include <sstream>
+#include <string>
+#include <vector>
+
+#include "LogGenerator/LogGenerator.h"
+#include "platform/CellMonitor.h"
+#include "platform/Log.h"
+#include "platform/LogChannelTechnology.h"
+#include "platform/PropertyList.h"
+#include "telephonyd/LogCodeSimulator.h"
+
+namespace corvane::telephonyd {
+namespace {
+
+using Cell = SimulatedNetwork::Cell;
+using Access = SimulatedNetwork::Access;
+using Phase = SimulatedNetwork::Phase;
+
+constexpr std::uint64_t kStart = 1'800'000'000'000'000;  // microseconds: 2027-01-15 08:00 UTC
+constexpr std::uint64_t kMicrosecondsPerPeriod = 40'000;
+constexpr std::uint64_t kPeriodsPerSecond = 25;
+constexpr std::uint64_t kSeed = 2;
+
+// --- Reading the scenario period by period ---
+
+struct Period {
+  std::uint64_t number = 0;
+  std::vector<SourcePacket> packets;
+  // The network as the encoders saw it in this period.
+  SimulatedNetwork network;
+};
+
+class PeriodReader {
+ public:
+  explicit PeriodReader(std::uint64_t seed)
+      : scenario_(makeLogCodeScenario(kLogChannelTechnologyQuendraGSM, seed, kStart)) {}
+
+  // The next period that has packets. The scenario runs a period when the
+  // packets of the one before are all taken, so right after a packet comes
+  // the network is still that of the packet's period.
+  Period next() {
+    SourcePacket first = ahead_ ? std::move(*ahead_) : scenario_->nextPacket();
+    Period period{periodOf(first), {std::move(first)}, aheadNetwork_ ? *aheadNetwork_ : scenario_->network()};
+    ahead_.reset();
+    for (;;) {
+      SourcePacket packet = scenario_->nextPacket();
+      if (periodOf(packet) != period.number) {
+        ahead_ = std::move(packet);
+        aheadNetwork_ = scenario_->network();
+        return period;
+      }
+      period.packets.push_back(std::move(packet));
+    }
+  }
+
+ private:
+  static std::uint64_t periodOf(const SourcePacket& packet) {
+    std::uint64_t timestamp = 0;
+    for (int i = 7; i >= 0; --i) timestamp = timestamp << 8 | packet.data->at(static_cast<std::size_t>(5 + i));
+    return (timestamp - kStart) / kMicrosecondsPerPeriod;
+  }
+
+  std::unique_ptr<LogCodeSimulator> scenario_;
+  std::optional<SourcePacket> ahead_;
+  std::optional<SimulatedNetwork> aheadNetwork_;
+};
+
+std::vector<std::uint32_t> codesOf(const Period& period) {
+  std::vector<std::uint32_t> codes;
+  for (const SourcePacket& packet : period.packets) codes.push_back(*packet.code);
+  return codes;
+}
+
+bool has(const Period& period, std::uint32_t code) {
+  const auto codes = codesOf(period);
+  return std::find(codes.begin(), codes.end(), code) != codes.end();
+}
+
+// --- Reading the display ---
+
+const Value* findNode(const Value& node, std::string_view name) {
+  const Dictionary* d = node.asDictionary();
+  if (!d) return nullptr;
+  for (const auto& [key, value] : d->entries()) {
+    if (key == name) return &value;
+    if (const Value* found = findNode(value, name)) return found;
+  }
+  return nullptr;
+}
+
+std::string rowText(const Value& display, std::string_view section, std::string_view row) {
+  const Value* rows = findNode(display, section);
+  const Value* v = rows && rows->asDictionary() ? rows->asDictionary()->find(row) : nullptr;
+  return v && v->asString() ? *v->asString() : "<none>";
+}
+
+std::string textIn(const Dictionary& rows, std::string_view key) {
+  const Value* v = rows.find(key);
+  return v && v->asString() ? *v->asString() : "<none>";
+}
+
+std::vector<Dictionary> listRows(const Value& display, std::string_view section) {
+  std::vector<Dictionary> rows;
+  const Value* list = findNode(display, section);
+  if (!list || !list->asArray()) throw std::runtime_error(std::string(section) + " is no list");
+  for (const Value& row : list->asArray()->elements()) rows.push_back(*row.asDictionary());
+  return rows;
+}
+
+std::vector<std::string> stringsIn(const Value& display, std::string_view section, std::string_view row) {
+  const Value* rows = findNode(display, section);
+  const Value* v = rows && rows->asDictionary() ? rows->asDictionary()->find(row) : nullptr;
+  std::vector<std::string> out;
+  if (v && v->asArray()) {
+    for (const Value& e : v->asArray()->elements()) out.push_back(e.asString() ? *e.asString() : "<no text>");
+  }
+  return out;
+}
+
+// The GSM/UMTS decoder, fed packet by packet.
+class GsmUmtsDecoder {
+ public:
+  GsmUmtsDecoder() : generator_(LogGenerator::generatorFromTechnology(kLogChannelTechnologyQuendraGSM)) {}
+  void feed(const Period& period) {
+    for (const SourcePacket& packet : period.packets) generator_->updateState(state_, *packet.data);
+  }
+  Value display() { return generator_->generateLogUsingState(state_); }
+
+ private:
+  log::ScopedCapture quiet_;
+  std::unique_ptr<LogGenerator> generator_;
+  Dictionary state_;
+};
+
+std::string number(long long value) { return std::to_string(value); }
+
+std::int64_t integerIn(const Dictionary& d, std::string_view key) {
+  const Value* v = d.find(key);
+  if (!v || !v->asInteger()) throw std::runtime_error("no integer under " + std::string(key));
+  return *v->asInteger();
+}
+
+// The serving cell of the cell list in an 0xFF0001 packet.
+std::optional<Dictionary> listedServingCell(const Period& period) {
+  for (const SourcePacket& packet : period.packets) {
+    if (*packet.code != 0xFF0001) continue;
+    const Value cells = plist::parseOrThrow(std::span(*packet.data).subspan(13));
+    return *cells.asArray()->at(0).asDictionary();
+  }
+  return std::nullopt;
+}
+
+const char* phaseName(Phase phase) {
+  switch (phase) {
+    case Phase::UmtsIdle: return "UMTS idle";
+    case Phase::UmtsConnecting: return "connecting";
+    case Phase::UmtsFach: return "FACH";
+    case Phase::UmtsDch: return "DCH";
+    case Phase::UmtsFading: return "fading";
+    case Phase::GsmIdle: return "GSM idle";
+    case Phase::GsmDedicated: return "GSM dedicated";
+    case Phase::GsmLeaving: return "leaving GSM";
+  }
+  return "?";
+}
+
+// --- The journey ---
+
+TEST(GsmUmtsRadioEncoderTest, ThePhoneGoesFromUmtsIdleThroughFachAndDchToGsmAndBackAgainAndAgain) {
+  PeriodReader reader(kSeed);
+  GsmUmtsDecoder decoder;
+  std::vector<std::string> phases;       // each new one
+  std::vector<std::string> rrcStates;    // as the display shows them, each new one
+  std::vector<std::string> servingRats;  // as the cell list names them, each new one
+  for (;;) {
+    const Period period = reader.next();
+    if (period.number >= 150 * kPeriodsPerSecond) break;
+    decoder.feed(period);
+    const std::string phase = phaseName(period.network.phase());
+    if (phases.empty() || phases.back() != phase) phases.push_back(phase);
+    if (has(period, 0x4125)) {
+      const std::string state = rowText(decoder.display(), "UMTS RR Info", "RRC State");
+      if (rrcStates.empty() || rrcStates.back() != state) rrcStates.push_back(state);
+    }
+    if (auto serving = listedServingCell(period)) {
+      const Value* access = serving->find(CellMonitorCellRadioAccessTechnology);
+      const std::string rat = *access->asString();
+      if (servingRats.empty() || servingRats.back() != rat) servingRats.push_back(rat);
+    }
+  }
+  const std::vector<std::string> cycle = {"UMTS idle", "connecting", "FACH",          "DCH",
+                                          "fading",    "GSM idle",   "GSM dedicated", "leaving GSM"};
+  ASSERT_GE(phases.size(), 2 * cycle.size() + 1);
+  for (std::size_t i = 0; i < phases.size(); ++i) EXPECT_EQ(phases[i], cycle[i % cycle.size()]) << i;
+  // The RRC state as the decoder shows it: connection set-up, FACH, DCH, release; nothing of it on GSM.
+  ASSERT_GE(rrcStates.size(), 9u);
+  const std::vector<std::string> states = {"Disconnected", "Connecting", "CELL_FACH", "CELL_DCH"};
+  for (std::size_t i = 0; i < rrcStates.size(); ++i) EXPECT_EQ(rrcStates[i], states[i % states.size()]) << i;
+  // The cell list's serving cell follows: UMTS, GSM, UMTS ...
+  ASSERT_GE(servingRats.size(), 5u);
+  for (std::size_t i = 0; i < servingRats.size(); ++i) {
+    EXPECT_EQ(servingRats[i], i % 2 == 0 ? CellMonitorRadioAccessTechnologyUMTS : CellMonitorRadioAccessTechnologyGSM);
+  }
+}
+
+TEST(GsmUmtsRadioEncoderTest, EachRecordIsSentOnlyWhereThePhoneIsAndAtItsCadence) {
+  struct Cadence {
+    std::uint32_t code;
+    std::uint64_t periods;
+    bool (*applies)(Phase phase, Access camped);
+  };
+  const std::vector<Cadence> cadences = {
+      {0x7132, 250, [](Phase, Access) { return true; }},
+      {0x7135, 125, [](Phase, Access) { return true; }},
+      {0x7150, 250, [](Phase, Access) { return true; }},
+      {0x4125, 50, [](Phase, Access a) { return a == Access::UMTS; }},
+      {0x4127, 50, [](Phase, Access a) { return a == Access::UMTS; }},
+      {0x4157, 50, [](Phase, Access a) { return a == Access::UMTS; }},
+      {0x417A, 10, [](Phase, Access a) { return a == Access::UMTS; }},
+      {0x4005, 32, [](Phase p, Access a) { return a == Access::UMTS && p != Phase::UmtsDch; }},
+      {0x4031, 25,
+       [](Phase p, Access) { return p == Phase::UmtsConnecting || p == Phase::UmtsFach || p == Phase::UmtsDch; }},
+      {0x4116, 25, [](Phase p, Access) { return p == Phase::UmtsDch; }},
+      {0x51FF, 50, [](Phase, Access a) { return a == Access::GSM; }},
+      {0x5134, 50, [](Phase, Access a) { return a == Access::GSM; }},
+      {0x5137, 12, [](Phase, Access a) { return a == Access::GSM; }},
+      {0x51F8, 50, [](Phase p, Access) { return p == Phase::GsmDedicated; }},
+      {0x5076, 12, [](Phase p, Access) { return p == Phase::GsmDedicated; }},
+  };
+  PeriodReader reader(kSeed);
+  std::map<std::uint32_t, int> sent;
+  std::uint64_t lastChanges = 0;
+  for (;;) {
+    const Period period = reader.next();
+    if (period.number >= 120 * kPeriodsPerSecond) break;
+    const SimulatedNetwork& network = period.network;
+    const std::uint64_t changes = network.cellChanges() + network.phaseChanges();
+    const bool changed = period.number == 0 || changes != lastChanges;
+    lastChanges = changes;
+    SCOPED_TRACE("period " + std::to_string(period.number));
+    for (const Cadence& cadence : cadences) {
+      const bool applies = cadence.applies(network.phase(), network.servingCell().access);
+      const bool due = applies && (changed || period.number % cadence.periods == 0);
+      EXPECT_EQ(has(period, cadence.code), due) << std::hex << cadence.code;
+      sent[cadence.code] += has(period, cadence.code) ? 1 : 0;
+    }
+  }
+  for (const Cadence& cadence : cadences) EXPECT_GT(sent[cadence.code], 2) << std::hex << cadence.code;
+}
+
+// --- Agreement with the cell list and the network ---
+
+TEST(GsmUmtsRadioEncoderTest, EveryRecordAgreesWithTheCellListAndTheNetworkAsThePhoneMoves) {
+  PeriodReader reader(kSeed);
+  GsmUmtsDecoder decoder;
+  int umtsChecks = 0, gsmChecks = 0, dchChecks = 0, hoppingChecks = 0;
+  std::set<std::size_t> activeSetSizes;
+  std::set<std::string> transmitPowers;
+  for (;;) {
+    const Period period = reader.next();
+    if (period.number >= 150 * kPeriodsPerSecond) break;
+    decoder.feed(period);
+    const auto listed = listedServingCell(period);
+    if (!listed) continue;  // a whole second: the cell list and everything due with it
+    const Value display = decoder.display();
+    const SimulatedNetwork& network = period.network;
+    const Cell& serving = network.servingCell();
+    SCOPED_TRACE("period " + std::to_string(period.number) + ", " + phaseName(network.phase()));
+
+    EXPECT_EQ(integerIn(*listed, CellMonitorCellId), serving.cellId);
+    EXPECT_EQ(integerIn(*listed, CellMonitorLAC), serving.areaCode);
+    // Whichever of the cell list and 0x7135 wrote last: one network, one area.
+    EXPECT_EQ(rowText(display, "Serving PLMN", "Location Area Code"), number(serving.areaCode));
+    const std::string mcc = rowText(display, "Serving PLMN", "Mobile Country Code");
+    const std::string mnc = rowText(display, "Serving PLMN", "Mobile Network Code");
+    EXPECT_TRUE(mcc == "001" || mcc == "1") << mcc;
+    EXPECT_TRUE(mnc == "01 " || mnc == "1") << mnc;
+    for (const Dictionary& row : listRows(display, "Equivalent PLMN List")) {
+      EXPECT_EQ(textIn(row, "Mobile Country Code"), "1");
+      EXPECT_EQ(textIn(row, "Mobile Network Code"), "1");
+    }
+
+    if (serving.access == Access::UMTS) {
+      ++umtsChecks;
+      EXPECT_EQ(rowText(display, "UMTS RR Info", "Cell ID"), number(serving.cellId));
+      EXPECT_EQ(rowText(display, "UMTS RR Info", "Scrambling Code"), number(serving.code));
+      // The cell list's UARFCN row goes with each 0x4127 that follows it.
+      const std::string downlink = rowText(display, "UMTS RR Info", "Downlink Frequency");
+      EXPECT_EQ(downlink, number(serving.channel));
+      EXPECT_EQ(rowText(display, "UMTS RR Info", "Uplink Frequency"), number(serving.channel - 950));
+      EXPECT_EQ(rowText(display, "UMTS RR Info", "URA ID"), number(network.uraIdentity(serving)));
+      const bool connected = network.phase() == Phase::UmtsConnecting || network.phase() == Phase::UmtsFach ||
+                             network.phase() == Phase::UmtsDch;
+      EXPECT_EQ(rowText(display, "UMTS RR Info", "Ciphering"), connected ? "Enabled" : "Disabled");
+
+      if (!has(period, 0x417A)) continue;
+      // The active set: the network's, serving cell first, its RSCP and Ec/Io those of the cell list.
+      const auto active = network.activeSet();
+      const auto rows = listRows(display, "Active Set");
+      ASSERT_EQ(rows.size(), active.size());
+      activeSetSizes.insert(rows.size());
+      EXPECT_EQ(textIn(rows[0], "Scrambling Code"), number(serving.code));
+      EXPECT_EQ(textIn(rows[0], "RSCP"), number(serving.level) + " dB");
+      EXPECT_EQ(textIn(rows[0], "Energy Per Chip"), number(serving.quality) + " dB");
+      EXPECT_EQ(integerIn(*listed, CellMonitorRSCP), serving.level);
+      EXPECT_EQ(integerIn(*listed, CellMonitorECN0), serving.quality);
+      for (std::size_t i = 0; i < rows.size(); ++i) {
+        EXPECT_EQ(textIn(rows[i], "Scrambling Code"), number(active[i]->code));
+        EXPECT_EQ(textIn(rows[i], "Energy Per Chip"), number(active[i]->quality) + " dB");
+        EXPECT_EQ(active[i]->channel, serving.channel);
+      }
+      if (network.phase() == Phase::UmtsDch) {
+        ++dchChecks;
+        EXPECT_LE(rows.size(), 3u);
+        const auto channels = listRows(display, "Transport Channels");
+        ASSERT_EQ(channels.size(), 2u);
+        EXPECT_EQ(textIn(channels[0], "Transport Channel ID"), "1");
+        EXPECT_EQ(textIn(channels[0], "CRC Received"), "100");
+        EXPECT_EQ(textIn(channels[1], "Transport Channel ID"), "2");
+        EXPECT_EQ(textIn(channels[1], "CRC Received"), "25");
+        EXPECT_LE(std::stoi(textIn(channels[0], "CRC Received in Error")), 10);
+        EXPECT_EQ(rowText(display, "BLER", "Window Size"), "100");
+        transmitPowers.insert(rowText(display, "UMTS RR Info", "Transmit Power"));
+      } else {
+        EXPECT_EQ(rows.size(), 1u) << "outside DCH the active set is the serving cell";
+      }
+    } else {
+      ++gsmChecks;
+      EXPECT_EQ(rowText(display, "GSM Serving Cell", "Cell ID"), number(serving.cellId));
+      EXPECT_EQ(rowText(display, "GSM Serving Cell", "ARFCN"), number(serving.channel));
+      EXPECT_EQ(rowText(display, "GSM Serving Cell", "BSIC"), number(serving.code));
+      EXPECT_EQ(integerIn(*listed, CellMonitorARFCN), serving.channel);
+      if (has(period, 0x5137)) {
+        EXPECT_EQ(rowText(display, "GSM Serving Cell", "RSSI"), number(-serving.level) + " dBm");
+        const int c1 = serving.level + 104;
+        EXPECT_EQ(rowText(display, "GSM Serving Cell", "C1 Value"), number(c1 & 0xFFFF));
+        EXPECT_EQ(rowText(display, "GSM Serving Cell", "C2 Value"), number((c1 + 4) & 0xFFFF));
+      }
+      if (network.phase() == Phase::GsmDedicated) {
+        ++hoppingChecks;
+        std::vector<std::string> allocation;
+        for (int arfcn : serving.mobileAllocation) allocation.push_back(number(arfcn));
+        EXPECT_EQ(stringsIn(display, "Mobile Allocation", "ARFCNs"), allocation);
+        EXPECT_EQ(rowText(display, "Mobile Allocation", "HSN"), number(serving.hoppingSequence));
+        const std::string hop = rowText(display, "GSM Serving Cell", "MA Dedicated ARFCN");
+        EXPECT_NE(std::find(allocation.begin(), allocation.end(), hop), allocation.end()) << hop;
+      }
+    }
+  }
+  EXPECT_GT(umtsChecks, 60);
+  EXPECT_GT(gsmChecks, 30);
+  EXPECT_GT(dchChecks, 10);
+  EXPECT_GT(hoppingChecks, 5);
+  EXPECT_EQ(activeSetSizes, (std::set<std::size_t>{1, 2, 3}));
+  EXPECT_GT(transmitPowers.size(), 3u);
+}
+
+TEST(GsmUmtsRadioEncoderTest, GsmMeasurementsListTheMeasuredNeighboursWithTheirBsicsAndC1) {
+  PeriodReader reader(kSeed);
+  GsmUmtsDecoder decoder;
+  int checked = 0;
+  std::map<int, int> bsics;  // of the last 0x51FF: ARFCN -> BSIC
+  for (;;) {
+    const Period period = reader.next();
+    ASSERT_LT(period.number, 150 * kPeriodsPerSecond);
+    decoder.feed(period);
+    if (has(period, 0x51FF)) {
+      bsics.clear();
+      for (const Cell& cell : period.network.cells()) {
+        if (cell.access == Access::GSM && !cell.serving && cell.measured) bsics[cell.channel] = cell.code;
+      }
+    }
+    if (period.network.servingCell().access != Access::GSM || !has(period, 0x5137)) continue;
+    // The cell list's neighbours come later in a second that has both; take the periods without it.
+    if (has(period, 0xFF0001)) continue;
+    std::vector<const Cell*> measured;
+    for (const Cell& cell : period.network.cells()) {
+      if (cell.access == Access::GSM && !cell.serving && cell.measured) measured.push_back(&cell);
+    }
+    std::stable_sort(measured.begin(), measured.end(), [](const Cell* a, const Cell* b) { return a->level > b->level; });
+    const Value display = decoder.display();
+    const auto rows = listRows(display, "Neighboring Cells");
+    ASSERT_EQ(rows.size(), measured.size());
+    for (std::size_t i = 0; i < rows.size(); ++i) {
+      const Cell& cell = *measured[i];
+      EXPECT_EQ(textIn(rows[i], "ARFCN"), number(cell.channel));
+      EXPECT_EQ(textIn(rows[i], "RSSI"), number(-cell.level));
+      EXPECT_EQ(textIn(rows[i], "C1 Value"), number(cell.level + 104));
+      // A BSIC once an 0x51FF has named the cell's.
+      EXPECT_EQ(textIn(rows[i], "BSIC"), bsics.count(cell.channel) ? number(bsics[cell.channel]) : "<none>");
+      EXPECT_EQ(bsics.count(cell.channel) ? bsics[cell.channel] : cell.code, cell.code);
+    }
+    if (++checked == 40) break;
+  }
+}
+
+TEST(GsmUmtsRadioEncoderTest, RankedCellsAlternateBetweenTheUmtsAndTheGsmNeighbours) {
+  PeriodReader reader(kSeed);
+  GsmUmtsDecoder decoder;
+  int umts = 0, gsm = 0;
+  for (;;) {
+    const Period period = reader.next();
+    ASSERT_LT(period.number, 150 * kPeriodsPerSecond);
+    decoder.feed(period);
+    if (!has(period, 0x4005) || has(period, 0xFF0001)) continue;
+    const Value display = decoder.display();
+    const auto umtsRows = listRows(display, "UMTS Set");
+    const auto gsmRows = listRows(display, "GSM Set");
+    std::vector<const Cell*> expected;
+    const Access ranked = umtsRows.empty() ? Access::GSM : Access::UMTS;
+    for (const Cell& cell : period.network.cells()) {
+      if (cell.access == ranked && !cell.serving && cell.measured) expected.push_back(&cell);
+    }
+    std::stable_sort(expected.begin(), expected.end(), [](const Cell* a, const Cell* b) { return a->level > b->level; });
+    if (ranked == Access::UMTS) {
+      ++umts;
+      EXPECT_TRUE(gsmRows.empty());
+      ASSERT_EQ(umtsRows.size(), expected.size());
+      for (std::size_t i = 0; i < expected.size(); ++i) {
+        const Cell& cell = *expected[i];
+        char ecNo[32];
+        std::snprintf(ecNo, sizeof ecNo, "%f dB", cell.quality * 1.0);
+        EXPECT_EQ(Value(umtsRows[i]), Value([&] {
+                    Dictionary d;
+                    d.set("Scrambling Code", Value(number(cell.code)));
+                    d.set("RSCP", Value(number(cell.level) + " dB"));
+                    d.set("Energy Per Chip", Value(std::string(ecNo)));
+                    d.set("Downlink Frequency", Value(number(cell.channel)));
+                    d.set("Ranking Value", Value(number(cell.level - 3)));
+                    d.set("Rank Cell RSCP", Value(number(cell.level) + " dB"));
+                    return d;
+                  }()));
+      }
+    } else {
+      ++gsm;
+      ASSERT_EQ(gsmRows.size(), expected.size());
+      ASSERT_FALSE(gsmRows.empty());
+      for (std::size_t i = 0; i < expected.size(); ++i) {
+        EXPECT_EQ(textIn(gsmRows[i], "ARFCN"), number(expected[i]->channel));
+        EXPECT_EQ(textIn(gsmRows[i], "BSIC"), number(expected[i]->code));
+        EXPECT_EQ(textIn(gsmRows[i], "RSSI"), number(expected[i]->level) + " dBm");
+        EXPECT_EQ(textIn(gsmRows[i], "Ranking Value"), number(expected[i]->level - 6));
+      }
+    }
+    if (umts >= 5 && gsm >= 5) break;
+  }
+}
+
+// --- Every section of the scenario's records ---
+
+TEST(GsmUmtsRadioEncoderTest, EverySectionOfTheRecordsShowsValuesAtSomePoint) {
+  // The sections these records feed. "Detected Set", "Monitored Set" and
+  // "Virtual Active Set" list no cell whatever the record holds, and the
+  // non-ranked sets and "UMTS RR Measurement" take no records at all.
+  const std::vector<std::string> rowSections = {"Serving PLMN", "GSM Serving Cell", "UMTS RR Info", "Mobile Allocation",
+                                                "BLER"};
+  const std::vector<std::string> listSections = {"Equivalent PLMN List", "Neighboring Cells", "Active Set", "UMTS Set",
+                                                 "GSM Set", "Transport Channels"};
+  std::map<std::string, std::set<std::string>> filledRows;  // section -> rows seen with a value
+  std::set<std::string> filledLists;
+  std::map<std::string, std::set<std::string>> templateRows;
+  PeriodReader reader(kSeed);
+  GsmUmtsDecoder decoder;
+  for (;;) {
+    const Period period = reader.next();
+    if (period.number >= 120 * kPeriodsPerSecond) break;
+    decoder.feed(period);
+    if (period.number % 50 != 0) continue;  // the display every 2 s, as the application makes it
+    const Value display = decoder.display();
+    for (const std::string& section : rowSections) {
+      const Dictionary& rows = *findNode(display, section)->asDictionary();
+      for (const auto& [row, value] : rows.entries()) {
+        templateRows[section].insert(row);
+        const bool filled = value.asString() ? *value.asString() != "-" && !value.asString()->empty()
+                                             : value.asArray() && value.asArray()->size() > 0;
+        if (filled) filledRows[section].insert(row);
+      }
+    }
+    for (const std::string& section : listSections) {
+      const Value* list = findNode(display, section);
+      if (list && list->asArray() && list->asArray()->size() > 0) filledLists.insert(section);
+    }
+  }
+  for (const std::string& section : rowSections) {
+    EXPECT_EQ(filledRows[section], templateRows[section]) << section;
+    EXPECT_GE(filledRows[section].size(), 2u) << section;
+  }
+  EXPECT_EQ(filledLists, std::set<std::string>(listSections.begin(), listSections.end()));
+}
+
+// --- Determinism ---
+
+TEST(GsmUmtsRadioEncoderTest, TheSameSeedGivesTheSameBytesAndAnotherSeedOthers) {
+  auto a = makeLogCodeScenario(kLogChannelTechnologyQuendraGSM, kSeed, kStart);
+  auto b = makeLogCodeScenario(kLogChannelTechnologyQuendraGSM, kSeed, kStart);
+  auto c = makeLogCodeScenario(kLogChannelTechnologyQuendraGSM, kSeed + 1, kStart);
+  int differ = 0;
+  for (int i = 0; i < 3000; ++i) {
+    const SourcePacket pa = a->nextPacket();
+    ASSERT_EQ(*pa.data, *b->nextPacket().data) << i;
+    differ += *pa.data != *c->nextPacket().data ? 1 : 0;
+  }
+  EXPECT_GT(differ, 1500);
+}
+
+}  // namespace
+}  // namespace corvane::telephonyd
