@@ -93,6 +93,9 @@ int main(int argc, char** argv) {
     std::fprintf(stderr, "corvane: %s\n", error.c_str());
     return kExitFailure;
   }
+  // A port waiting on a silent peer gives up at once when a termination
+  // signal is pending, so the signal is handled without delay.
+  platform->ports().interruptWaitsWhenReadable(signalEvents->pendingDescriptor());
 
   Preferences preferences;
   CorvaneApp corvane(CorvaneAppEnvironment{platform->environment(), preferences, deviceRoot()});

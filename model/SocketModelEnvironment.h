@@ -28,6 +28,7 @@ class SocketModelEnvironment {
   // Valid for as long as this object lives; the model must go first.
   CorvaneModelEnvironment environment();
   RunLoop& runLoop() { return runLoop_; }
+  SocketPortSystem& ports() { return ports_; }
   const std::filesystem::path& runtimeDirectory() const { return ports_.directory(); }
 
  private:
