@@ -250,6 +250,103 @@ class ScreenshotTest : public QObject {
       }
     }
   }
+
+  // The GSM/UMTS phone's journey on the GSM/UMTS screens: each screen is
+  // waited on until the phone is where that screen has something to show
+  // (DCH for the active set and the RRC state, GSM for the serving cell and
+  // its neighbours), then kept as a picture.
+  void theGsmUmtsScenarioShowsTheJourneyOnTheGsmAndUmtsScreens() {
+    // About 25 packets a second: some three simulated seconds for each real one.
+    LiveService service({"--technology", "Quendra_GSM", "--seed", "2", "--rate", "25"});
+    QVERIFY2(service.platform_, service.error_.c_str());
+    QTRY_VERIFY_WITH_TIMEOUT(service.listening(), 10000);
+
+    Preferences preferences(service.configDirectory());
+    {
+      CorvaneApp app(CorvaneAppEnvironment{service.platform_->environment(), preferences, service.root_});
+      QVERIFY(launch(app));
+      QWidget* window = app.window();
+      NavigationController* navigation = app.navigationController();
+      auto top = [&] { return qobject_cast<CorvanePaneController*>(navigation->topViewController()); };
+      QTRY_VERIFY_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 4, 20000);
+      QCOMPARE(test::cellAt(top(), 0)->key->text(), QStringLiteral("Serving Cell"));
+
+      auto open = [&](const QString& key) {
+        const int row = test::rowWithKey(top(), key);
+        if (row < 0) return false;
+        test::tapRow(top(), row);
+        return true;
+      };
+      auto openSection = [&](const QString& group, const QString& section) {
+        navigation->popToViewController(navigation->viewControllers().front(), false);
+        return open(group) && open(section);
+      };
+      auto valueOf = [&](const QString& key) {
+        const int row = test::rowWithKey(top(), key);
+        return row < 0 || !test::cellAt(top(), row)->value ? QString() : test::cellAt(top(), row)->value->text();
+      };
+      // A list's rows open entries and have no value.
+      auto rowsText = [&] {
+        QStringList rows;
+        for (int i = 0; i < top()->tableView()->numberOfRows(); ++i) {
+          const CorvaneCell* cell = test::cellAt(top(), i);
+          rows << cell->key->text() + QLatin1Char('=') + (cell->value ? cell->value->text() : QString());
+        }
+        return rows.join(QStringLiteral(", "));
+      };
+      // Rows all hold decoded values: none is empty or the template's "-".
+      auto decoded = [&] {
+        if (top()->tableView()->numberOfRows() == 0) return false;
+        for (int i = 0; i < top()->tableView()->numberOfRows(); ++i) {
+          const QString value = test::cellAt(top(), i)->value->text();
+          if (value.isEmpty() || value == QLatin1String("-")) return false;
+        }
+        return true;
+      };
+      // Several journeys at this pace.
+      constexpr int kJourney = 60000;
+
+      QVERIFY(openSection(QStringLiteral("Serving Cell"), QStringLiteral("Serving PLMN")));
+      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), kJourney);
+      QVERIFY(valueOf(QStringLiteral("Mobile Country Code")) == QLatin1String("1") ||
+              valueOf(QStringLiteral("Mobile Country Code")) == QLatin1String("001"));
+      QVERIFY(keep(window, QStringLiteral("gsm-serving-plmn")));
+
+      // CELL_DCH with soft handover: two or three cells in the active set.
+      QVERIFY(openSection(QStringLiteral("Neighbours"), QStringLiteral("Active Set")));
+      QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 2, qPrintable(rowsText()), kJourney);
+      QVERIFY(keep(window, QStringLiteral("gsm-active-set-list")));
+      QVERIFY(open(QStringLiteral("0")));
+      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), 10000);
+      QVERIFY(valueOf(QStringLiteral("RSCP")).endsWith(QStringLiteral(" dB")));
+      QVERIFY(keep(window, QStringLiteral("gsm-active-set")));
+
+      QVERIFY(openSection(QStringLiteral("Serving Cell"), QStringLiteral("UMTS RR Info")));
+      QTRY_VERIFY2_WITH_TIMEOUT(decoded() && valueOf(QStringLiteral("RRC State")) == QLatin1String("CELL_DCH") &&
+                                    valueOf(QStringLiteral("Ciphering")) == QLatin1String("Enabled"),
+                                qPrintable(rowsText()), kJourney);
+      QVERIFY(valueOf(QStringLiteral("Transmit Power")).endsWith(QStringLiteral(" dBm")));
+      QVERIFY(keep(window, QStringLiteral("gsm-umts-rr-info")));
+
+      // On GSM, on a hopping channel: every row of the serving cell filled.
+      QVERIFY(openSection(QStringLiteral("Serving Cell"), QStringLiteral("GSM Serving Cell")));
+      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), kJourney);
+      QVERIFY(valueOf(QStringLiteral("RSSI")).endsWith(QStringLiteral(" dBm")));
+      QVERIFY(keep(window, QStringLiteral("gsm-serving-cell")));
+
+      // The neighbours of 0x5137 carry the BSICs of 0x51FF.
+      QVERIFY(openSection(QStringLiteral("Neighbours"), QStringLiteral("Neighboring Cells")));
+      QTRY_VERIFY_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 1, kJourney);
+      QVERIFY(open(QStringLiteral("0")));
+      QTRY_VERIFY2_WITH_TIMEOUT(decoded() && test::rowWithKey(top(), QStringLiteral("BSIC")) >= 0 &&
+                                    test::rowWithKey(top(), QStringLiteral("C1 Value")) >= 0,
+                                qPrintable(rowsText()), kJourney);
+      QVERIFY(keep(window, QStringLiteral("gsm-neighboring-cell")));
+      navigation->popViewControllerAnimated(false);
+      QVERIFY(top()->tableView()->numberOfRows() >= 1);
+      QVERIFY(keep(window, QStringLiteral("gsm-neighboring-cells-list")));
+    }
+  }
 };
 
 }  // namespace corvane

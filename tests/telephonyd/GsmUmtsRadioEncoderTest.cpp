@@ -519,5 +519,69 @@ TEST(GsmUmtsRadioEncoderTest, TheSameSeedGivesTheSameBytesAndAnotherSeedOthers) 
   EXPECT_GT(differ, 1500);
 }
 
+// --- The sample session of corvane-decode ---
+
+const std::string kSamplePath = std::string(CORVANE_SOURCE_DIR) + "/tools/samples/gsm-umts-session.hex";
+// Seed 6's phone is on UMTS until 29 s (DCH from 13 s to 22 s), on GSM until
+// 43 s (dedicated from 33 s to 40 s) and back on UMTS after: a whole journey.
+// Its last second ends on a ranking of the GSM neighbours followed by a cell
+// list, so that every section the records feed shows values at the end.
+constexpr std::uint64_t kSampleSeed = 6;
+constexpr std::uint64_t kSampleSeconds = 46;
+
+std::string sampleContents() {
+  const std::string seed = std::to_string(kSampleSeed);
+  std::string text =
+      "# The first " + std::to_string(kSampleSeconds) + " simulated seconds of corvane-telephonyd's Quendra_GSM scenario,\n"
+      "# seed " + seed + ", clock start 1800000000 s, one packet per line: what\n"
+      "#   corvane-telephonyd --technology Quendra_GSM --seed " + seed + " --clock-start 1800000000\n"
+      "# streams first to a client whose start command asks for the GSM/UMTS codes.\n"
+      "# The phone camps on UMTS (idle, FACH, DCH), reselects to GSM (idle, then a\n"
+      "# call on a hopping channel) and returns to UMTS.\n"
+      "# Written by corvane_telephonyd_tests --gtest_filter='GsmUmtsSessionSample.*' with\n"
+      "# CORVANE_UPDATE_SAMPLES=1; without it that test checks that this is still what\n"
+      "# the scenario sends.\n";
+  PeriodReader reader(kSampleSeed);
+  for (;;) {
+    const Period period = reader.next();
+    if (period.number >= kSampleSeconds * kPeriodsPerSecond) break;
+    for (const SourcePacket& packet : period.packets) {
+      std::string line;
+      for (std::uint8_t byte : *packet.data) {
+        if (!line.empty()) line += ' ';
+        line += "0123456789abcdef"[byte >> 4];
+        line += "0123456789abcdef"[byte & 15];
+      }
+      text += line + "\n";
+    }
+  }
+  return text;
+}
+
+TEST(GsmUmtsSessionSample, IsWhatTheScenarioSendsInItsFirstSeconds) {
+  const std::string expected = sampleContents();
+  const char* update = std::getenv("CORVANE_UPDATE_SAMPLES");
+  if (update && std::string(update) == "1") {
+    std::ofstream(kSamplePath, std::ios::binary | std::ios::trunc) << expected;
+  }
+  std::ifstream file(kSamplePath, std::ios::binary);
+  ASSERT_TRUE(file) << kSamplePath;
+  std::stringstream contents;
+  contents << file.rdbuf();
+  EXPECT_EQ(contents.str(), expected) << "renew it with CORVANE_UPDATE_SAMPLES=1";
+}
+
+TEST(GsmUmtsSessionSample, CoversAWholeJourneyFromUmtsToGsmAndBack) {
+  PeriodReader reader(kSampleSeed);
+  std::vector<Access> camped;
+  for (;;) {
+    const Period period = reader.next();
+    if (period.number >= kSampleSeconds * kPeriodsPerSecond) break;
+    const Access access = period.network.servingCell().access;
+    if (camped.empty() || camped.back() != access) camped.push_back(access);
+  }
+  EXPECT_EQ(camped, (std::vector<Access>{Access::UMTS, Access::GSM, Access::UMTS}));
+}
+
 }  // namespace
 }  // namespace corvane::telephonyd
