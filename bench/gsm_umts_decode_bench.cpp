@@ -1,0 +1,162 @@
+// GSM/UMTS decode throughput: packets per second on one core through the real
+// QND_GSM generator, its class index and its sections, into a display built
+// from the QND_GSM template. The packets are the simulator's own: the
+// Quendra_GSM scenario (seed 2) over one whole journey, from UMTS idle through
+// FACH and DCH to GSM idle and dedicated and back to UMTS (its first 45
+// simulated seconds), taken before the timed loop.
+//
+// As in lte_decode_bench, the sections trace every packet at level 4, so the
+// figure depends on where those lines go:
+//   Syslog          the production sink (syslog(3));
+//   EveryLine       a sink that takes every line and drops it;
+//   ErrorsOnly      a sink that takes only levels 0-3.
+// BM_GsmUmtsDecodeMix holds the radio log codes alone, as the LTE mix does;
+// BM_GsmUmtsDecodeMixWithExtraCodes adds the SIM files, cell lists and PDP
+// contexts that the scenario sends beside them (property lists, parsed per
+// packet). BM_GsmUmtsDecodeByCode shows each radio code alone and
+// BM_GsmUmtsUpdateStateMix goes through updateState, which also keeps the raw
+// packets for the DLF log.
+
+#include <benchmark/benchmark.h>
+
+#include <cstdint>
+#include <memory>
+#include <vector>
+
+#include "LogGenerator/gsm_umts/QND_GSMLogGenerator.h"
+#include "platform/Log.h"
+#include "platform/LogChannelTechnology.h"
+#include "telephonyd/LogCodeSimulator.h"
+
+namespace {
+
+using namespace corvane;
+
+constexpr std::uint64_t kSeed = 2;
+constexpr std::uint64_t kStart = 1'800'000'000'000'000;  // microseconds
+constexpr std::uint64_t kJourneyMicroseconds = 45'000'000;
+
+// The scenario's packets of one journey; with or without the extra codes.
+std::vector<Bytes> journey(bool extraCodes) {
+  auto scenario = telephonyd::makeLogCodeScenario(kLogChannelTechnologyQuendraGSM, kSeed, kStart);
+  std::vector<Bytes> packets;
+  for (;;) {
+    const telephonyd::SourcePacket packet = scenario->nextPacket();
+    std::uint64_t timestamp = 0;
+    for (int i = 7; i >= 0; --i) timestamp = timestamp << 8 | packet.data->at(static_cast<std::size_t>(5 + i));
+    if (timestamp - kStart >= kJourneyMicroseconds) break;
+    if (extraCodes || *packet.code < telephonyd::kExtraCodeBase) packets.push_back(*packet.data);
+  }
+  return packets;
+}
+
+// --- Sinks ---
+
+class EveryLineSink final : public log::Sink {
+ public:
+  void write(int, std::string_view text) override { benchmark::DoNotOptimize(text.data()); }
+};
+
+class ErrorsOnlySink final : public log::Sink {
+ public:
+  void write(int, std::string_view text) override { benchmark::DoNotOptimize(text.data()); }
+  bool wants(int priority) const override { return priority <= log::kError; }
+};
+
+enum class SinkKind { Syslog, EveryLine, ErrorsOnly };
+
+std::shared_ptr<log::Sink> makeSink(SinkKind kind) {
+  switch (kind) {
+    case SinkKind::Syslog: return std::make_shared<log::SyslogSink>();
+    case SinkKind::EveryLine: return std::make_shared<EveryLineSink>();
+    case SinkKind::ErrorsOnly: return std::make_shared<ErrorsOnlySink>();
+  }
+  return nullptr;
+}
+
+// A generator whose display is built, as after the first packet.
+struct DecodingSetUp {
+  DecodingSetUp() {
+    log::setSink(std::make_shared<EveryLineSink>());
+    generator_.getDisplayFromState(state_);
+  }
+  QND_GSMLogGenerator generator_;
+  Dictionary state_;
+};
+
+void runPackets(benchmark::State& state, const std::vector<Bytes>& packets, SinkKind sink) {
+  if (packets.empty()) {
+    state.SkipWithError("no packets");
+    return;
+  }
+  DecodingSetUp setUp;
+  log::setSink(makeSink(sink));
+  std::size_t next = 0;
+  for (auto _ : state) {
+    setUp.generator_.updateWithData(packets[next]);
+    if (++next == packets.size()) next = 0;
+  }
+  state.counters["packets_per_second"] =
+      benchmark::Counter(static_cast<double>(state.iterations()), benchmark::Counter::kIsRate);
+  state.counters["packets_in_mix"] = static_cast<double>(packets.size());
+}
+
+void BM_GsmUmtsDecodeMix(benchmark::State& state, SinkKind sink) { runPackets(state, journey(false), sink); }
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeMix, Syslog, SinkKind::Syslog);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeMix, EveryLine, SinkKind::EveryLine);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeMix, ErrorsOnly, SinkKind::ErrorsOnly);
+
+void BM_GsmUmtsDecodeMixWithExtraCodes(benchmark::State& state) {
+  runPackets(state, journey(true), SinkKind::ErrorsOnly);
+}
+BENCHMARK(BM_GsmUmtsDecodeMixWithExtraCodes);
+
+// Each radio code of the journey alone.
+void BM_GsmUmtsDecodeByCode(benchmark::State& state, std::uint32_t code) {
+  std::vector<Bytes> packets;
+  for (Bytes& packet : journey(false)) {
+    if (static_cast<std::uint32_t>(packet[3] | packet[4] << 8) == code) packets.push_back(std::move(packet));
+  }
+  runPackets(state, packets, SinkKind::ErrorsOnly);
+}
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x4005, 0x4005u);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x4031, 0x4031u);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x4116, 0x4116u);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x4125, 0x4125u);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x4127, 0x4127u);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x4157, 0x4157u);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x417A, 0x417Au);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x5076, 0x5076u);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x5134, 0x5134u);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x5137, 0x5137u);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x51F8, 0x51F8u);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x51FF, 0x51FFu);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x7132, 0x7132u);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x7135, 0x7135u);
+BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x7150, 0x7150u);
+
+// Through updateState, which also appends each packet to the bytes kept for
+// the DLF log. The display generation that hands those bytes over is left
+// out of the timing.
+void BM_GsmUmtsUpdateStateMix(benchmark::State& state) {
+  const std::vector<Bytes> packets = journey(false);
+  DecodingSetUp setUp;
+  log::setSink(makeSink(SinkKind::ErrorsOnly));
+  std::size_t next = 0;
+  std::size_t sinceDisplay = 0;
+  for (auto _ : state) {
+    setUp.generator_.updateState(setUp.state_, packets[next]);
+    if (++next == packets.size()) next = 0;
+    if (++sinceDisplay == 100000) {
+      state.PauseTiming();
+      setUp.generator_.generateLogUsingState(setUp.state_);
+      sinceDisplay = 0;
+      state.ResumeTiming();
+    }
+  }
+  state.counters["packets_per_second"] =
+      benchmark::Counter(static_cast<double>(state.iterations()), benchmark::Counter::kIsRate);
+}
+BENCHMARK(BM_GsmUmtsUpdateStateMix);
+
+}  // namespace
