@@ -24,6 +24,7 @@
 #include <vector>
 
 #include "LogGenerator/gsm_umts/QND_GSMLogGenerator.h"
+#include "DecodeBenchSinks.h"
 #include "platform/Log.h"
 #include "platform/LogChannelTechnology.h"
 #include "telephonyd/LogCodeSimulator.h"
@@ -50,29 +51,9 @@ std::vector<Bytes> journey(bool extraCodes) {
   return packets;
 }
 
-// --- Sinks ---
-
-class EveryLineSink final : public log::Sink {
- public:
-  void write(int, std::string_view text) override { benchmark::DoNotOptimize(text.data()); }
-};
-
-class ErrorsOnlySink final : public log::Sink {
- public:
-  void write(int, std::string_view text) override { benchmark::DoNotOptimize(text.data()); }
-  bool wants(int priority) const override { return priority <= log::kError; }
-};
-
-enum class SinkKind { Syslog, EveryLine, ErrorsOnly };
-
-std::shared_ptr<log::Sink> makeSink(SinkKind kind) {
-  switch (kind) {
-    case SinkKind::Syslog: return std::make_shared<log::SyslogSink>();
-    case SinkKind::EveryLine: return std::make_shared<EveryLineSink>();
-    case SinkKind::ErrorsOnly: return std::make_shared<ErrorsOnlySink>();
-  }
-  return nullptr;
-}
+using bench::EveryLineSink;
+using bench::makeSink;
+using bench::SinkKind;
 
 // A generator whose display is built, as after the first packet.
 struct DecodingSetUp {

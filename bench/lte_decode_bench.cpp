@@ -24,6 +24,7 @@
 #include "LogGenerator/gsm_umts/QND_GSMLogGenerator.h"
 #include "LogGenerator/lte/LTELogGenerator.h"
 #include "LogGenerator/utran/UTRANLogGenerator.h"
+#include "DecodeBenchSinks.h"
 #include "platform/Log.h"
 
 namespace {
@@ -153,29 +154,9 @@ std::vector<Bytes> realisticMix() {
   return mix;
 }
 
-// --- Sinks ---
-
-class EveryLineSink final : public log::Sink {
- public:
-  void write(int, std::string_view text) override { benchmark::DoNotOptimize(text.data()); }
-};
-
-class ErrorsOnlySink final : public log::Sink {
- public:
-  void write(int, std::string_view text) override { benchmark::DoNotOptimize(text.data()); }
-  bool wants(int priority) const override { return priority <= log::kError; }
-};
-
-enum class SinkKind { Syslog, EveryLine, ErrorsOnly };
-
-std::shared_ptr<log::Sink> makeSink(SinkKind kind) {
-  switch (kind) {
-    case SinkKind::Syslog: return std::make_shared<log::SyslogSink>();
-    case SinkKind::EveryLine: return std::make_shared<EveryLineSink>();
-    case SinkKind::ErrorsOnly: return std::make_shared<ErrorsOnlySink>();
-  }
-  return nullptr;
-}
+using bench::EveryLineSink;
+using bench::makeSink;
+using bench::SinkKind;
 
 // A generator whose display is built, as after the first packet.
 struct DecodingSetUp {

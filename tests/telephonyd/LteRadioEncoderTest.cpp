@@ -25,6 +25,7 @@
 #include "platform/PropertyList.h"
 #include "support/Values.h"
 #include "telephonyd/LogCodeSimulator.h"
+#include "telephonyd/ScenarioPeriods.h"
 
 namespace corvane::telephonyd {
 namespace {
@@ -34,55 +35,25 @@ using Access = SimulatedNetwork::Access;
 using test::D;
 using test::S;
 
-constexpr std::uint64_t kStart = 1'800'000'000'000'000;  // microseconds: 2027-01-15 08:00 UTC
-constexpr std::uint64_t kMicrosecondsPerPeriod = 40'000;
 // In the first minute of seed 3 the serving cell changes once, at 34 s, to
 // another cell of its band-3 carrier; neighbours go unmeasured now and then.
 constexpr std::uint64_t kSeed = 3;
-constexpr std::uint64_t kPeriodsPerSecond = 25;
 
 // --- Reading the scenario period by period ---
 
-struct Period {
-  std::uint64_t number = 0;
-  std::vector<SourcePacket> packets;
-  // The network as the encoders saw it in this period.
-  SimulatedNetwork network;
-};
+using scenario::codesOf;
+using scenario::findNode;
+using scenario::kPeriodsPerSecond;
+using scenario::listRows;
+using scenario::Period;
+using scenario::rowText;
+using scenario::textIn;
+constexpr std::uint64_t kStart = scenario::kScenarioStart;
 
-class PeriodReader {
+// The Quendra_LTE scenario, period by period.
+class PeriodReader : public scenario::PeriodReader {
  public:
-  explicit PeriodReader(std::uint64_t seed)
-      : scenario_(makeLogCodeScenario(kLogChannelTechnologyQuendraLTE, seed, kStart)) {}
-
-  // The next period that has packets. The scenario runs a period when the
-  // packets of the one before are all taken, so right after a packet comes
-  // the network is still that of the packet's period.
-  Period next() {
-    SourcePacket first = ahead_ ? std::move(*ahead_) : scenario_->nextPacket();
-    Period period{periodOf(first), {std::move(first)}, aheadNetwork_ ? *aheadNetwork_ : scenario_->network()};
-    ahead_.reset();
-    for (;;) {
-      SourcePacket packet = scenario_->nextPacket();
-      if (periodOf(packet) != period.number) {
-        ahead_ = std::move(packet);
-        aheadNetwork_ = scenario_->network();
-        return period;
-      }
-      period.packets.push_back(std::move(packet));
-    }
-  }
-
- private:
-  static std::uint64_t periodOf(const SourcePacket& packet) {
-    std::uint64_t timestamp = 0;
-    for (int i = 7; i >= 0; --i) timestamp = timestamp << 8 | packet.data->at(static_cast<std::size_t>(5 + i));
-    return (timestamp - kStart) / kMicrosecondsPerPeriod;
-  }
-
-  std::unique_ptr<LogCodeSimulator> scenario_;
-  std::optional<SourcePacket> ahead_;
-  std::optional<SimulatedNetwork> aheadNetwork_;
+  explicit PeriodReader(std::uint64_t seed) : scenario::PeriodReader(kLogChannelTechnologyQuendraLTE, seed) {}
 };
 
 Period periodNumber(std::uint64_t seed, std::uint64_t number) {
@@ -94,43 +65,7 @@ Period periodNumber(std::uint64_t seed, std::uint64_t number) {
   }
 }
 
-std::vector<std::uint32_t> codesOf(const Period& period) {
-  std::vector<std::uint32_t> codes;
-  for (const SourcePacket& packet : period.packets) codes.push_back(*packet.code);
-  return codes;
-}
-
 // --- Reading the display ---
-
-// The node of that name anywhere in the display, depth first.
-const Value* findNode(const Value& node, std::string_view name) {
-  const Dictionary* d = node.asDictionary();
-  if (!d) return nullptr;
-  for (const auto& [key, value] : d->entries()) {
-    if (key == name) return &value;
-    if (const Value* found = findNode(value, name)) return found;
-  }
-  return nullptr;
-}
-
-std::string rowText(const Value& display, std::string_view section, std::string_view row) {
-  const Value* rows = findNode(display, section);
-  const Value* v = rows && rows->asDictionary() ? rows->asDictionary()->find(row) : nullptr;
-  return v && v->asString() ? *v->asString() : "<none>";
-}
-
-std::string textIn(const Dictionary& rows, std::string_view key) {
-  const Value* v = rows.find(key);
-  return v && v->asString() ? *v->asString() : "<none>";
-}
-
-std::vector<Dictionary> listRows(const Value& display, std::string_view section) {
-  std::vector<Dictionary> rows;
-  const Value* list = findNode(display, section);
-  if (!list || !list->asArray()) throw std::runtime_error(std::string(section) + " is no list");
-  for (const Value& row : list->asArray()->elements()) rows.push_back(*row.asDictionary());
-  return rows;
-}
 
 // The LTE decoder, fed packet by packet.
 class LteDecoder {
@@ -504,13 +439,7 @@ std::string sampleContents() {
     const Period period = reader.next();
     if (period.number >= kSampleSeconds * kPeriodsPerSecond) break;
     for (const SourcePacket& packet : period.packets) {
-      std::string line;
-      for (std::uint8_t byte : *packet.data) {
-        if (!line.empty()) line += ' ';
-        line += "0123456789abcdef"[byte >> 4];
-        line += "0123456789abcdef"[byte & 15];
-      }
-      text += line + "\n";
+      text += scenario::hexLine(*packet.data) + "\n";
     }
   }
   return text;

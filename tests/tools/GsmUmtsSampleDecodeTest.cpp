@@ -13,42 +13,21 @@
 
 #include <nlohmann/json.hpp>
 
+#include "support/JsonTree.h"
 #include "support/Process.h"
 
 namespace corvane {
 namespace {
 
-using Json = nlohmann::ordered_json;
+using Json = test::JsonTree;
 
 const std::string kDecode = CORVANE_DECODE_BINARY;
 const std::string kSample = std::string(CORVANE_SOURCE_DIR) + "/tools/samples/gsm-umts-session.hex";
 
-// The node of that name anywhere in the tree, depth first.
-const Json* findNode(const Json& node, const std::string& name) {
-  if (node.value("name", "") == name) return &node;
-  if (!node.contains("children")) return nullptr;
-  for (const Json& child : node["children"]) {
-    if (const Json* found = findNode(child, name)) return found;
-  }
-  return nullptr;
-}
-
-std::map<std::string, std::string> rowsOf(const Json& section) {
-  std::map<std::string, std::string> rows;
-  for (const Json& child : section.value("children", Json::array())) {
-    if (child.contains("value")) rows[child["name"].get<std::string>()] = child["value"].get<std::string>();
-  }
-  return rows;
-}
-
-// Every value below the node, with its path.
+const Json* findNode(const Json& node, const std::string& name) { return test::findJsonNode(node, name); }
+std::map<std::string, std::string> rowsOf(const Json& section) { return test::jsonRowsOf(section); }
 void collectValues(const Json& node, const std::string& path, std::vector<std::pair<std::string, std::string>>& out) {
-  const std::string here = path + "/" + node["name"].get<std::string>();
-  if (node.contains("value")) {
-    out.emplace_back(here, node["value"].get<std::string>());
-    return;
-  }
-  for (const Json& child : node.value("children", Json::array())) collectValues(child, here, out);
+  test::collectJsonValues(node, path, out);
 }
 
 class GsmUmtsSampleDecode : public ::testing::Test {
