@@ -447,15 +447,8 @@ std::string sampleContents() {
 
 TEST(LteSessionSample, IsWhatTheScenarioSendsInItsFirstSeconds) {
   const std::string expected = sampleContents();
-  const char* update = std::getenv("CORVANE_UPDATE_SAMPLES");
-  if (update && std::string(update) == "1") {
-    std::ofstream(kSamplePath, std::ios::binary | std::ios::trunc) << expected;
-  }
-  std::ifstream file(kSamplePath, std::ios::binary);
-  ASSERT_TRUE(file) << kSamplePath;
-  std::stringstream contents;
-  contents << file.rdbuf();
-  EXPECT_EQ(contents.str(), expected) << "renew it with CORVANE_UPDATE_SAMPLES=1";
+  EXPECT_EQ(scenario::sampleFile(kSamplePath, expected), expected)
+      << kSamplePath << ": renew it with CORVANE_UPDATE_SAMPLES=1";
 }
 
 }  // namespace

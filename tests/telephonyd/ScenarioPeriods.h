@@ -4,8 +4,11 @@
 // packets make: shared by the tests of the radio encoders.
 
 #include <cstdint>
+#include <cstdlib>
+#include <fstream>
 #include <memory>
 #include <optional>
+#include <sstream>
 #include <stdexcept>
 #include <string>
 #include <string_view>
@@ -77,6 +80,17 @@ inline std::string hexLine(const Bytes& packet) {
     line += "0123456789abcdef"[byte & 15];
   }
   return line;
+}
+
+// The sample file's contents as they are; written from `expected` first when
+// CORVANE_UPDATE_SAMPLES=1. Empty when the file cannot be read.
+inline std::string sampleFile(const std::string& path, const std::string& expected) {
+  const char* update = std::getenv("CORVANE_UPDATE_SAMPLES");
+  if (update && std::string(update) == "1") std::ofstream(path, std::ios::binary | std::ios::trunc) << expected;
+  std::ifstream file(path, std::ios::binary);
+  std::stringstream contents;
+  contents << file.rdbuf();
+  return contents.str();
 }
 
 // --- Reading the display ---
