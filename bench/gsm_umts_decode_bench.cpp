@@ -53,6 +53,7 @@ std::vector<Bytes> journey(bool extraCodes) {
 
 using bench::EveryLineSink;
 using bench::makeSink;
+using bench::runUpdateState;
 using bench::SinkKind;
 
 // A generator whose display is built, as after the first packet.
@@ -123,20 +124,7 @@ void BM_GsmUmtsUpdateStateMix(benchmark::State& state) {
   const std::vector<Bytes> packets = journey(false);
   DecodingSetUp setUp;
   log::setSink(makeSink(SinkKind::ErrorsOnly));
-  std::size_t next = 0;
-  std::size_t sinceDisplay = 0;
-  for (auto _ : state) {
-    setUp.generator_.updateState(setUp.state_, packets[next]);
-    if (++next == packets.size()) next = 0;
-    if (++sinceDisplay == 100000) {
-      state.PauseTiming();
-      setUp.generator_.generateLogUsingState(setUp.state_);
-      sinceDisplay = 0;
-      state.ResumeTiming();
-    }
-  }
-  state.counters["packets_per_second"] =
-      benchmark::Counter(static_cast<double>(state.iterations()), benchmark::Counter::kIsRate);
+  runUpdateState(state, setUp, packets);
 }
 BENCHMARK(BM_GsmUmtsUpdateStateMix);
 

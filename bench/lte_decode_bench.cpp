@@ -156,6 +156,7 @@ std::vector<Bytes> realisticMix() {
 
 using bench::EveryLineSink;
 using bench::makeSink;
+using bench::runUpdateState;
 using bench::SinkKind;
 
 // A generator whose display is built, as after the first packet.
@@ -204,20 +205,7 @@ void BM_LteUpdateStateMix(benchmark::State& state) {
   const std::vector<Bytes> packets = realisticMix();
   DecodingSetUp setUp;
   log::setSink(makeSink(SinkKind::ErrorsOnly));
-  std::size_t next = 0;
-  std::size_t sinceDisplay = 0;
-  for (auto _ : state) {
-    setUp.generator_.updateState(setUp.state_, packets[next]);
-    if (++next == packets.size()) next = 0;
-    if (++sinceDisplay == 100000) {
-      state.PauseTiming();
-      setUp.generator_.generateLogUsingState(setUp.state_);
-      sinceDisplay = 0;
-      state.ResumeTiming();
-    }
-  }
-  state.counters["packets_per_second"] =
-      benchmark::Counter(static_cast<double>(state.iterations()), benchmark::Counter::kIsRate);
+  runUpdateState(state, setUp, packets);
 }
 BENCHMARK(BM_LteUpdateStateMix);
 
