@@ -172,7 +172,12 @@ int main(int argc, char** argv) {
   // Before any input is read: a technology without a decoder is said at once.
   std::unique_ptr<LogGenerator> generator = LogGenerator::generatorFromTechnology(technology);
   if (!generator) {
-    std::fprintf(stderr, "corvane-decode: no decoder for technology \"%s\" in this version\n", technology.c_str());
+    std::string decoded;
+    for (auto t : kAllLogChannelTechnologies) {
+      if (LogGenerator::generatorFromTechnology(t)) decoded += (decoded.empty() ? "" : ", ") + std::string(t);
+    }
+    std::fprintf(stderr, "corvane-decode: no decoder for technology \"%s\" in this version; these have one: %s\n",
+                 technology.c_str(), decoded.c_str());
     return kExitInput;
   }
   const std::function<bool(std::uint32_t)> codeRead = codesReadBy(technology);

@@ -182,7 +182,9 @@ TEST(FramedCapture, RandomBytesAreNoCapture) {
 TEST(FramedCapture, ATechnologyWithoutADecoderIsSaidBeforeAnyInputIsRead) {
   const auto r = test::runProcess({kDecode, "-t", "Quendra_CDMA", "/nonexistent/capture.bin"});
   EXPECT_EQ(r.exitCode, 1);
-  EXPECT_EQ(r.err, "corvane-decode: no decoder for technology \"Quendra_CDMA\" in this version\n");
+  EXPECT_EQ(r.err,
+            "corvane-decode: no decoder for technology \"Quendra_CDMA\" in this version; these have one: "
+            "IFX, Quendra_GSM, Quendra_LTE, Quendra_UTRAN2\n");
 }
 
 TEST(FramedCapture, ADlfDamagedInTheMiddleIsDecodedUpToTheDamageWhichIsNamed) {
