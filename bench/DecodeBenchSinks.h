@@ -41,6 +41,36 @@ inline std::shared_ptr<log::Sink> makeSink(SinkKind kind) {
   return nullptr;
 }
 
+// A generator whose display is built, as after the first packet.
+template <class Generator>
+struct DecodingSetUp {
+  DecodingSetUp() {
+    log::setSink(std::make_shared<EveryLineSink>());
+    generator_.getDisplayFromState(state_);
+  }
+  Generator generator_;
+  Dictionary state_;
+};
+
+// Decodes the packets, over and over, with the log lines going to `sink`.
+template <class Generator>
+void runPackets(benchmark::State& state, const std::vector<Bytes>& packets, SinkKind sink) {
+  if (packets.empty()) {
+    state.SkipWithError("no packets");
+    return;
+  }
+  DecodingSetUp<Generator> setUp;
+  log::setSink(makeSink(sink));
+  std::size_t next = 0;
+  for (auto _ : state) {
+    setUp.generator_.updateWithData(packets[next]);
+    if (++next == packets.size()) next = 0;
+  }
+  state.counters["packets_per_second"] =
+      benchmark::Counter(static_cast<double>(state.iterations()), benchmark::Counter::kIsRate);
+  state.counters["packets_in_mix"] = static_cast<double>(packets.size());
+}
+
 // Folds the packets, over and over, through the generator's updateState,
 // which also appends each packet to the bytes kept for the DLF log. The
 // display generation that hands those bytes over (every 100,000 packets) is

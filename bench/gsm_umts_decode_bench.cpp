@@ -51,36 +51,14 @@ std::vector<Bytes> journey(bool extraCodes) {
   return packets;
 }
 
-using bench::EveryLineSink;
 using bench::makeSink;
 using bench::runUpdateState;
 using bench::SinkKind;
 
-// A generator whose display is built, as after the first packet.
-struct DecodingSetUp {
-  DecodingSetUp() {
-    log::setSink(std::make_shared<EveryLineSink>());
-    generator_.getDisplayFromState(state_);
-  }
-  QND_GSMLogGenerator generator_;
-  Dictionary state_;
-};
+using DecodingSetUp = bench::DecodingSetUp<QND_GSMLogGenerator>;
 
 void runPackets(benchmark::State& state, const std::vector<Bytes>& packets, SinkKind sink) {
-  if (packets.empty()) {
-    state.SkipWithError("no packets");
-    return;
-  }
-  DecodingSetUp setUp;
-  log::setSink(makeSink(sink));
-  std::size_t next = 0;
-  for (auto _ : state) {
-    setUp.generator_.updateWithData(packets[next]);
-    if (++next == packets.size()) next = 0;
-  }
-  state.counters["packets_per_second"] =
-      benchmark::Counter(static_cast<double>(state.iterations()), benchmark::Counter::kIsRate);
-  state.counters["packets_in_mix"] = static_cast<double>(packets.size());
+  bench::runPackets<QND_GSMLogGenerator>(state, packets, sink);
 }
 
 void BM_GsmUmtsDecodeMix(benchmark::State& state, SinkKind sink) { runPackets(state, journey(false), sink); }

@@ -154,31 +154,14 @@ std::vector<Bytes> realisticMix() {
   return mix;
 }
 
-using bench::EveryLineSink;
 using bench::makeSink;
 using bench::runUpdateState;
 using bench::SinkKind;
 
-// A generator whose display is built, as after the first packet.
-struct DecodingSetUp {
-  DecodingSetUp() {
-    log::setSink(std::make_shared<EveryLineSink>());
-    generator_.getDisplayFromState(state_);
-  }
-  LTELogGenerator generator_;
-  Dictionary state_;
-};
+using DecodingSetUp = bench::DecodingSetUp<LTELogGenerator>;
 
 void runPackets(benchmark::State& state, const std::vector<Bytes>& packets, SinkKind sink) {
-  DecodingSetUp setUp;
-  log::setSink(makeSink(sink));
-  std::size_t next = 0;
-  for (auto _ : state) {
-    setUp.generator_.updateWithData(packets[next]);
-    if (++next == packets.size()) next = 0;
-  }
-  state.counters["packets_per_second"] =
-      benchmark::Counter(static_cast<double>(state.iterations()), benchmark::Counter::kIsRate);
+  bench::runPackets<LTELogGenerator>(state, packets, sink);
 }
 
 void BM_LteDecodeMix(benchmark::State& state, SinkKind sink) { runPackets(state, realisticMix(), sink); }

@@ -435,14 +435,7 @@ std::string sampleContents() {
       "# CORVANE_UPDATE_SAMPLES=1; without it that test checks that this is still what\n"
       "# the scenario sends.\n";
   PeriodReader reader(kSeed);
-  for (;;) {
-    const Period period = reader.next();
-    if (period.number >= kSampleSeconds * kPeriodsPerSecond) break;
-    for (const SourcePacket& packet : period.packets) {
-      text += scenario::hexLine(*packet.data) + "\n";
-    }
-  }
-  return text;
+  return text + scenario::hexLinesOfFirstSeconds(reader, kSampleSeconds);
 }
 
 TEST(LteSessionSample, IsWhatTheScenarioSendsInItsFirstSeconds) {

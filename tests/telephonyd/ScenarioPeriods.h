@@ -82,6 +82,18 @@ inline std::string hexLine(const Bytes& packet) {
   return line;
 }
 
+// The packets of the scenario's first `seconds`, a hex line each: a sample
+// file's body.
+inline std::string hexLinesOfFirstSeconds(PeriodReader& reader, std::uint64_t seconds) {
+  std::string text;
+  for (;;) {
+    const Period period = reader.next();
+    if (period.number >= seconds * kPeriodsPerSecond) break;
+    for (const SourcePacket& packet : period.packets) text += hexLine(*packet.data) + "\n";
+  }
+  return text;
+}
+
 // The sample file's contents as they are; written from `expected` first when
 // CORVANE_UPDATE_SAMPLES=1. Empty when the file cannot be read.
 inline std::string sampleFile(const std::string& path, const std::string& expected) {
