@@ -12,14 +12,24 @@
 #include "LogGenerator/gsm_umts/records/CellSetRecord.h"
 #include "LogGenerator/gsm_umts/records/CipheringRecord.h"
 #include "LogGenerator/gsm_umts/records/DedicatedMobileAllocationRecord.h"
+#include "LogGenerator/gsm_umts/records/DtxRecord.h"
 #include "LogGenerator/gsm_umts/records/EquivalentPlmnRecord.h"
+#include "LogGenerator/gsm_umts/records/GmmStateRecord.h"
+#include "LogGenerator/gsm_umts/records/GprsCellAccessRecord.h"
+#include "LogGenerator/gsm_umts/records/GprsCellOptionsRecord.h"
 #include "LogGenerator/gsm_umts/records/GsmCellIdentityRecord.h"
 #include "LogGenerator/gsm_umts/records/GsmCellMeasurementRecord.h"
+#include "LogGenerator/gsm_umts/records/HsdpaStatisticsRecord.h"
+#include "LogGenerator/gsm_umts/records/MmStateRecord.h"
 #include "LogGenerator/gsm_umts/records/MobileAllocationRecord.h"
+#include "LogGenerator/gsm_umts/records/PacketSystemInfoRecord.h"
+#include "LogGenerator/gsm_umts/records/PbcchRecord.h"
 #include "LogGenerator/gsm_umts/records/PlmnSelectionModeRecord.h"
 #include "LogGenerator/gsm_umts/records/RankedCellsRecord.h"
 #include "LogGenerator/gsm_umts/records/RegistrationRecord.h"
+#include "LogGenerator/gsm_umts/records/RrStateRecord.h"
 #include "LogGenerator/gsm_umts/records/RrcStateRecord.h"
+#include "LogGenerator/gsm_umts/records/Si13PositionRecord.h"
 #include "LogGenerator/gsm_umts/records/TransmitPowerRecord.h"
 #include "LogGenerator/gsm_umts/records/UmtsCellRecord.h"
 #include "LogGenerator/records/EcIoTable.h"
@@ -61,6 +71,76 @@ std::uint32_t rrcStateOf(Phase phase) {
     if (entry.phase == phase) return entry.state;
   }
   throw std::logic_error("no RRC state while camped on GSM");
+}
+
+// --- Mobility management, GSM radio resource, GPRS and HSDPA ---
+
+// 0x7132's registration service states, and the network operating mode of 0x7135.
+constexpr std::uint32_t kServiceIdle = 1;         // REG_STATE_IDLE
+constexpr std::uint32_t kServiceRegistering = 2;  // REG_STATE_REGISTERING
+constexpr std::uint32_t kNetworkOperatingModeI = 0;  // "Class 1"
+
+// 0x7131: MM states, substates and update statuses.
+constexpr std::uint32_t kMmWaitForOutgoingConnection = 5;
+constexpr std::uint32_t kMmConnectionActive = 6;
+constexpr std::uint32_t kMmIdle = 19;
+constexpr std::uint32_t kMmLocationUpdatingPending = 23;
+constexpr std::uint32_t kMmLocationUpdateNeeded = 5;
+constexpr std::uint32_t kMmNormalService = 8;
+constexpr std::uint32_t kMmUpdated = 0;
+constexpr std::uint32_t kMmNotUpdated = 1;
+
+// 0x7130: GMM states, substates and update statuses.
+constexpr std::uint32_t kGmmRegisteredInitiated = 2;
+constexpr std::uint32_t kGmmRegistered = 3;
+constexpr std::uint32_t kGmmRoutingAreaUpdateInitiated = 5;
+constexpr std::uint32_t kGmmServiceRequestInitiated = 6;
+constexpr std::uint32_t kGmmNormalService = 0;
+constexpr std::uint32_t kGmmAttachNeeded = 2;
+constexpr std::uint32_t kGmmSuspended = 7;
+constexpr std::uint32_t kGmmUpdateNeeded = 8;
+constexpr std::uint32_t kGmmUpdated = 0;
+constexpr std::uint32_t kGmmNotUpdated = 1;
+
+// 0x512C: RR states and modes.
+constexpr std::uint32_t kRrIdle = 5;
+constexpr std::uint32_t kRrConnectionPending = 7;
+constexpr std::uint32_t kRrDataTransfer = 9;
+constexpr std::uint32_t kRrReselectionFromUmts = 14;  // RR_W2G_INTERRAT_RESELECTION_PROGRESS
+constexpr std::uint32_t kRrVoice = 0;
+constexpr std::uint32_t kRrData = 1;
+
+// The GPRS parameters that all GSM cells broadcast alike: packet flow
+// contexts not supported, priority classes 1 to 4 may access, the network
+// controls no reselection, DRX_TIMER_MAX 2 s, 8-bit access bursts, no PBCCH
+// (so no PSI messages) and packet SI status supported.
+constexpr std::uint32_t kPfcNotSupported = 0;
+constexpr std::uint32_t kPriorityClasses1To4 = 6;
+constexpr std::uint32_t kNetworkControlOrder0 = 0;
+constexpr std::uint32_t kDrxTimerMaxSeconds = 2;
+constexpr std::uint32_t kEightBitAccessBursts = 0;
+constexpr std::uint32_t kPacketSiStatusSupported = 1;
+// And those each cell sets for itself, chosen by its cell id: T3192 (500,
+// 80 or 1000 ms), where SI13 goes (every fourth cell on the extended BCCH)
+// and whether the reselection hysteresis applies (every other cell).
+constexpr std::array<std::uint32_t, 3> kT3192Codes = {0, 4, 1};
+std::uint32_t t3192Of(const Cell& cell) {
+  return kT3192Codes[static_cast<std::size_t>(cell.cellId) % kT3192Codes.size()];
+}
+std::uint32_t si13PositionOf(const Cell& cell) { return cell.cellId % 4 == 3 ? 1 : 0; }
+std::uint32_t hysteresisOf(const Cell& cell) { return cell.cellId % 2 == 0 ? 1 : 0; }
+
+// HSDPA in CELL_DCH: dual carrier, six HARQ processes a carrier, 500
+// sub-frames of 2 ms a record. A process is scheduled in most of its
+// sub-frames; a tenth of its first transmissions fail while the cell is good
+// (the usual target), more as its Ec/Io falls; a block holds more bits the
+// better the Ec/Io.
+constexpr std::uint32_t kHsdpaVersion = 2;
+constexpr std::uint32_t kDualCarrier = 2;
+constexpr std::size_t kHarqProcessesPerCarrier = 6;
+constexpr std::uint32_t kSubFramesPerRecord = 500;
+std::uint32_t bitsPerBlock(const Cell& cell) {
+  return static_cast<std::uint32_t>(3000 + 800 * std::clamp(cell.quality + 20, 0, 20));
 }
 
 bool onUmts(const SimulatedNetwork& network) { return network.servingCell().access == Access::UMTS; }
@@ -170,10 +250,12 @@ struct GsmUmtsRadioEncoder::Report {
 std::span<const GsmUmtsRadioEncoder::Report> GsmUmtsRadioEncoder::reports() {
   // In the order the records of one period go out: the BSICs before the
   // measurement that shows them.
-  static constexpr std::array<Report, 15> kReports = {{
-      {plmn_selection::kCode, 10000ms, Where::Anywhere, &GsmUmtsRadioEncoder::plmnSelectionMode},
+  static constexpr std::array<Report, 25> kReports = {{
+      {plmn_selection::kCode, 1000ms, Where::Anywhere, &GsmUmtsRadioEncoder::plmnSelectionMode},
       {gsm_umts::registration::kCode, 5000ms, Where::Anywhere, &GsmUmtsRadioEncoder::registration},
       {equivalent_plmn::kCode, 10000ms, Where::Anywhere, &GsmUmtsRadioEncoder::equivalentPlmns},
+      {mm_state::kCode, 1000ms, Where::Anywhere, &GsmUmtsRadioEncoder::mmState},
+      {gmm_state::kCode, 1000ms, Where::Anywhere, &GsmUmtsRadioEncoder::gmmState},
       {rrc_state::kCode, 2000ms, Where::Umts, &GsmUmtsRadioEncoder::rrcState},
       {umts_cell::kCode, 2000ms, Where::Umts, &GsmUmtsRadioEncoder::umtsCell},
       {gsm_umts::ciphering::kCode, 2000ms, Where::Umts, &GsmUmtsRadioEncoder::ciphering},
@@ -181,6 +263,14 @@ std::span<const GsmUmtsRadioEncoder::Report> GsmUmtsRadioEncoder::reports() {
       {ranked_cells::kCode, 1280ms, Where::UmtsRanking, &GsmUmtsRadioEncoder::rankedCells},
       {transmit_power::kCode, 1000ms, Where::UmtsConnected, &GsmUmtsRadioEncoder::transmitPower},
       {bler::kCode, 1000ms, Where::UmtsDch, &GsmUmtsRadioEncoder::blockErrors},
+      {hsdpa_statistics::kCode, 1000ms, Where::UmtsDch, &GsmUmtsRadioEncoder::hsdpaStatistics},
+      {rr_state::kCode, 2000ms, Where::Gsm, &GsmUmtsRadioEncoder::rrState},
+      {dtx::kCode, 2000ms, Where::Gsm, &GsmUmtsRadioEncoder::dtxState},
+      {si13_position::kCode, 2000ms, Where::Gsm, &GsmUmtsRadioEncoder::si13Position},
+      {gprs_access::kCode, 2000ms, Where::Gsm, &GsmUmtsRadioEncoder::gprsAccess},
+      {gprs_cell_options::kCode, 2000ms, Where::Gsm, &GsmUmtsRadioEncoder::gprsCellOptions},
+      {pbcch::kCode, 2000ms, Where::Gsm, &GsmUmtsRadioEncoder::pbcch},
+      {packet_system_info::kCode, 2000ms, Where::Gsm, &GsmUmtsRadioEncoder::packetSystemInfo},
       {arfcn_bsic::kCode, 2000ms, Where::Gsm, &GsmUmtsRadioEncoder::neighbourBsics},
       {gsm_cell_identity::kCode, 2000ms, Where::Gsm, &GsmUmtsRadioEncoder::gsmCellIdentity},
       {gsm_cell_measurement::kCode, 480ms, Where::Gsm, &GsmUmtsRadioEncoder::gsmCellMeasurement},
@@ -195,6 +285,7 @@ std::span<const GsmUmtsRadioEncoder::Report> GsmUmtsRadioEncoder::reports() {
 
 void GsmUmtsRadioEncoder::encode(const SimulatedNetwork& network, std::uint64_t period, std::uint64_t timestamp,
                                  std::vector<SourcePacket>& out) {
+  followRegistration(network);
   const bool changed =
       network.cellChanges() != reportedCellChanges_ || network.phaseChanges() != reportedPhaseChanges_;
   reportedCellChanges_ = network.cellChanges();
@@ -210,9 +301,12 @@ void GsmUmtsRadioEncoder::encode(const SimulatedNetwork& network, std::uint64_t 
 
 // --- Registration ---
 
-std::optional<Bytes> GsmUmtsRadioEncoder::plmnSelectionMode(const SimulatedNetwork&, std::uint64_t timestamp) {
+std::optional<Bytes> GsmUmtsRadioEncoder::plmnSelectionMode(const SimulatedNetwork& network,
+                                                            std::uint64_t timestamp) {
   using namespace plmn_selection;
   RecordWriter record(kMinimumLength);
+  record.put(kServiceState,
+             registrationState(network) == Registration::Registered ? kServiceIdle : kServiceRegistering);
   record.put(kMode, kAutomaticSelection);
   return record.packet(kCode, timestamp);
 }
@@ -226,6 +320,7 @@ std::optional<Bytes> GsmUmtsRadioEncoder::registration(const SimulatedNetwork& n
   constexpr std::array<std::uint32_t, 3> mncDigits = {mnc / 10, mnc % 10, 0xF};
   const Cell& serving = network.servingCell();
   RecordWriter record(kMinimumLength);
+  record.put(kNetworkOperatingMode, kNetworkOperatingModeI);
   record.put(kServiceType, kCsPsService);
   for (std::size_t i = 0; i < mccDigits.size(); ++i) record.put(kMccDigits[i], mccDigits[i]);
   for (std::size_t i = 0; i < mncDigits.size(); ++i) record.put(kMncDigits[i], mncDigits[i]);
@@ -430,6 +525,7 @@ std::optional<Bytes> GsmUmtsRadioEncoder::gsmCellMeasurement(const SimulatedNetw
   record.putValue(kServingRssi, -serving.level);
   record.put(kServingC1.field, kServingC1.rawFor(c1Of(serving)));
   record.put(kServingC2.field, kServingC2.rawFor(c1Of(serving) + kCellReselectOffset));
+  record.put(kCellReselectHysteresis, hysteresisOf(serving));
   record.put(kNeighborCount, static_cast<std::uint32_t>(cells.size()));
   std::size_t entry = kNeighbors.first;
   for (const Cell* cell : cells) {
@@ -463,6 +559,178 @@ std::optional<Bytes> GsmUmtsRadioEncoder::dedicatedChannel(const SimulatedNetwor
   const std::uint64_t hop = dedicatedRecords_++ % serving.mobileAllocation.size();
   RecordWriter record(kMinimumLength);
   record.put(kArfcn, unsignedOf(serving.mobileAllocation[hop]));
+  return record.packet(kCode, timestamp);
+}
+
+// --- Mobility management ---
+
+void GsmUmtsRadioEncoder::followRegistration(const SimulatedNetwork& network) {
+  // The first registration is the attach; each one after follows a reselection
+  // to the other access technology.
+  const Access access = network.servingCell().access;
+  if (registeredAccess_ != access) {
+    registeredAccess_ = access;
+    ++registrations_;
+    registrationStep_ = network.steps();
+  }
+  if (network.phaseChanges() != reportedPhaseChanges_ || network.steps() == 0) phaseStep_ = network.steps();
+}
+
+GsmUmtsRadioEncoder::Registration GsmUmtsRadioEncoder::registrationState(const SimulatedNetwork& network) const {
+  if (network.steps() != registrationStep_) return Registration::Registered;
+  return registrations_ == 1 ? Registration::Attaching : Registration::Updating;
+}
+
+std::optional<Bytes> GsmUmtsRadioEncoder::mmState(const SimulatedNetwork& network, std::uint64_t timestamp) {
+  using namespace mm_state;
+  const Registration registration = registrationState(network);
+  RecordWriter record(kMinimumLength);
+  if (registration == Registration::Registered) {
+    // A call is an MM connection, asked for in the first second of it.
+    const bool inCall = network.phase() == Phase::GsmDedicated;
+    record.put(kState, !inCall                         ? kMmIdle
+                       : phaseJustBegan(network) ? kMmWaitForOutgoingConnection
+                                                 : kMmConnectionActive);
+    record.put(kSubstate, kMmNormalService);
+    record.put(kUpdateStatus, kMmUpdated);
+  } else {
+    // In network operating mode I the location area is updated with the
+    // routing area, so MM waits for GMM. The location area has not changed at
+    // a reselection: it stays updated.
+    const bool attaching = registration == Registration::Attaching;
+    record.put(kState, kMmLocationUpdatingPending);
+    record.put(kSubstate, attaching ? kMmLocationUpdateNeeded : kMmNormalService);
+    record.put(kUpdateStatus, attaching ? kMmNotUpdated : kMmUpdated);
+  }
+  return record.packet(kCode, timestamp);
+}
+
+std::optional<Bytes> GsmUmtsRadioEncoder::gmmState(const SimulatedNetwork& network, std::uint64_t timestamp) {
+  using namespace gmm_state;
+  RecordWriter record(kMinimumLength);
+  switch (registrationState(network)) {
+    case Registration::Attaching:
+      record.put(kState, kGmmRegisteredInitiated);
+      record.put(kSubstate, kGmmAttachNeeded);
+      record.put(kUpdateStatus, kGmmNotUpdated);
+      break;
+    case Registration::Updating:
+      record.put(kState, kGmmRoutingAreaUpdateInitiated);
+      record.put(kSubstate, kGmmUpdateNeeded);
+      record.put(kUpdateStatus, kGmmNotUpdated);
+      break;
+    case Registration::Registered:
+      // Data asks for a connection first; a call on GSM suspends GPRS.
+      record.put(kState, network.phase() == Phase::UmtsConnecting ? kGmmServiceRequestInitiated : kGmmRegistered);
+      record.put(kSubstate, network.phase() == Phase::GsmDedicated ? kGmmSuspended : kGmmNormalService);
+      record.put(kUpdateStatus, kGmmUpdated);
+      break;
+  }
+  return record.packet(kCode, timestamp);
+}
+
+// --- GSM radio resource and GPRS ---
+
+std::optional<Bytes> GsmUmtsRadioEncoder::rrState(const SimulatedNetwork& network, std::uint64_t timestamp) {
+  using namespace rr_state;
+  const bool inCall = network.phase() == Phase::GsmDedicated;
+  RecordWriter record(kMinimumLength);
+  record.put(kState, registrationState(network) == Registration::Updating ? kRrReselectionFromUmts
+                     : !inCall                                            ? kRrIdle
+                     : phaseJustBegan(network)                            ? kRrConnectionPending
+                                                                          : kRrDataTransfer);
+  record.put(kStatus, inCall ? 1 : 0);
+  record.put(kMode, inCall ? kRrVoice : kRrData);
+  return record.packet(kCode, timestamp);
+}
+
+std::optional<Bytes> GsmUmtsRadioEncoder::dtxState(const SimulatedNetwork& network, std::uint64_t timestamp) {
+  using namespace dtx;
+  RecordWriter record(kMinimumLength);
+  record.put(kDtxUsed, network.phase() == Phase::GsmDedicated ? 1 : 0);
+  return record.packet(kCode, timestamp);
+}
+
+std::optional<Bytes> GsmUmtsRadioEncoder::si13Position(const SimulatedNetwork& network, std::uint64_t timestamp) {
+  using namespace si13_position;
+  RecordWriter record(kMinimumLength);
+  record.put(kPosition, si13PositionOf(network.servingCell()));
+  return record.packet(kCode, timestamp);
+}
+
+std::optional<Bytes> GsmUmtsRadioEncoder::gprsAccess(const SimulatedNetwork&, std::uint64_t timestamp) {
+  using namespace gprs_access;
+  RecordWriter record(kMinimumLength);
+  record.put(kPfcSupported, kPfcNotSupported);
+  record.put(kPriorityAccessThreshold, kPriorityClasses1To4);
+  record.put(kNetworkControlOrder, kNetworkControlOrder0);
+  return record.packet(kCode, timestamp);
+}
+
+std::optional<Bytes> GsmUmtsRadioEncoder::gprsCellOptions(const SimulatedNetwork& network, std::uint64_t timestamp) {
+  using namespace gprs_cell_options;
+  RecordWriter record(kMinimumLength);
+  record.put(kT3192Code, t3192Of(network.servingCell()));
+  record.put(kDrxTimerMax, kDrxTimerMaxSeconds);
+  record.put(kAccessBurstType, kEightBitAccessBursts);
+  return record.packet(kCode, timestamp);
+}
+
+std::optional<Bytes> GsmUmtsRadioEncoder::pbcch(const SimulatedNetwork&, std::uint64_t timestamp) {
+  RecordWriter record(pbcch::kMinimumLength);
+  record.put(pbcch::kPresent, 0);
+  return record.packet(pbcch::kCode, timestamp);
+}
+
+std::optional<Bytes> GsmUmtsRadioEncoder::packetSystemInfo(const SimulatedNetwork&, std::uint64_t timestamp) {
+  using namespace packet_system_info;
+  // Without a PBCCH there are no PSI messages to count.
+  RecordWriter record(kMinimumLength);
+  record.put(kPsiStatus, 0);
+  record.put(kCountLowRate, 0);
+  record.put(kCountHighRate, 0);
+  record.put(kExtMeasurementOrder, 0);
+  record.put(kSiStatus, kPacketSiStatusSupported);
+  return record.packet(kCode, timestamp);
+}
+
+// --- HSDPA ---
+
+std::optional<Bytes> GsmUmtsRadioEncoder::hsdpaStatistics(const SimulatedNetwork& network, std::uint64_t timestamp) {
+  using namespace hsdpa_statistics;
+  const Cell& serving = network.servingCell();
+  const std::uint64_t number = hsdpaRecords_++;
+  if (harqCounts_.empty() || harqStay_ != network.phaseChanges()) {
+    harqCounts_.assign(2 * kHarqProcessesPerCarrier, HarqCounts());
+    harqStay_ = network.phaseChanges();
+  }
+  const std::uint32_t errorPercent = serving.quality >= -8 ? 10 : serving.quality >= -12 ? 15 : 25;
+  const records::EntryList secondary = secondaryEntries(kHarqProcessesPerCarrier);
+  RecordWriter record(secondary.first + secondary.entrySize * kHarqProcessesPerCarrier);
+  record.put(kVersion, kHsdpaVersion);
+  record.put(kSubFrames, kSubFramesPerRecord);
+  record.put(kCarrier, kDualCarrier);
+  record.put(kPrimaryCount, kHarqProcessesPerCarrier);
+  record.put(kSecondaryCount, kHarqProcessesPerCarrier);
+  for (std::size_t i = 0; i < harqCounts_.size(); ++i) {
+    const std::size_t process = i % kHarqProcessesPerCarrier;
+    HarqCounts& counts = harqCounts_[i];
+    // Each process has a sixth of the sub-frames; it is scheduled in 70 to 99 % of them.
+    const auto fresh = static_cast<std::uint32_t>(
+        kSubFramesPerRecord / kHarqProcessesPerCarrier * static_cast<std::uint32_t>(70 + scatter(number, i, 0, 30)) /
+        100);
+    const auto failed = static_cast<std::uint32_t>(
+        (fresh * errorPercent + static_cast<std::uint32_t>(scatter(number, i, 1, 100))) / 100);
+    counts.newTransmissions += fresh;
+    counts.blockErrors += failed;
+    counts.receivedBits += (fresh - failed) * bitsPerBlock(serving);
+    const std::size_t entry = i < kHarqProcessesPerCarrier ? kPrimaryEntries.first + kEntrySize * process
+                                                           : secondary.first + kEntrySize * process;
+    record.put(kProcessId.at(entry), static_cast<std::uint32_t>(process));
+    record.put(kReceivedBits.at(entry), counts.receivedBits);
+    record.put(kNewTransmissions.at(entry), counts.newTransmissions);
+    record.put(kBlockErrors.at(entry), counts.blockErrors);
+  }
   return record.packet(kCode, timestamp);
 }
 

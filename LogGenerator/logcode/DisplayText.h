@@ -18,9 +18,10 @@ class Text {
  public:
   static constexpr std::size_t kCapacity = 32;
   Text() = default;
-  // A constant text; longer ones are cut at kCapacity.
-  explicit Text(std::string_view text) : size_(static_cast<std::uint8_t>(text.copy(chars_.data(), kCapacity))) {}
-  std::string_view view() const { return {chars_.data(), size_}; }
+  // A constant text (a value table's, "Not Present"): kept as a view, of any
+  // length, so it must outlive the Text, as the tables' texts do.
+  explicit Text(std::string_view constant) : constant_(constant) {}
+  std::string_view view() const { return constant_.data() ? constant_ : std::string_view(chars_.data(), size_); }
   operator std::string_view() const { return view(); }
 
   // For the text makers: the characters are written in place, then counted.
@@ -28,6 +29,7 @@ class Text {
   void setEnd(const char* end) { size_ = static_cast<std::uint8_t>(end - chars_.data()); }
 
  private:
+  std::string_view constant_{};
   std::array<char, kCapacity> chars_{};
   std::uint8_t size_ = 0;
 };
@@ -61,6 +63,7 @@ constexpr std::string_view textFor(std::span<const records::ValueText> table, st
   if (conversion.isNotPresent(raw)) return Text(kNotPresentText);
   switch (conversion.kind) {
     case Kind::Decimal: return decimalText(raw);
+    case Kind::Unsigned: return wholeText(raw, records::Unit());
     case Kind::Fixed:
       return conversion.inEighths ? eighthsText(conversion.eighths(raw), conversion.unit)
                                   : fixedText(conversion.value(raw), conversion.unit);

@@ -54,6 +54,7 @@ struct Unit {
 struct Conversion {
   enum class Kind : std::uint8_t {
     Decimal,  // "%d" of the value as a signed 32-bit number
+    Unsigned, // "%u" of the value as an unsigned 32-bit number
     Fixed,    // "%4.2f<unit>" of x × step + origin, in double precision
     Whole,    // "%d<unit>" of x × step + origin, taken as a signed 16-bit number
     Table,    // the text of a value table, or the fallback
@@ -89,6 +90,7 @@ struct Conversion {
     switch (kind) {
       case Kind::Fixed: return raw * step + origin;
       case Kind::Whole: return wholeValue(raw);
+      case Kind::Unsigned: return raw;
       default: return static_cast<std::int32_t>(raw);
     }
   }
@@ -106,7 +108,7 @@ struct Conversion {
     if (kind == Kind::Table || kind == Kind::Flag) {
       throw std::logic_error("a table or flag field is written with its raw value");
     }
-    const double x = kind == Kind::Decimal ? wanted : (wanted - origin) / step;
+    const double x = kind == Kind::Decimal || kind == Kind::Unsigned ? wanted : (wanted - origin) / step;
     if (x < 0 || x != std::floor(x) || x > 4294967295.0) {
       throw std::logic_error(std::to_string(wanted) + " is no whole number of " + std::to_string(step) +
                              " steps from " + std::to_string(origin));
@@ -116,6 +118,11 @@ struct Conversion {
 };
 
 constexpr Conversion decimal() { return Conversion(); }
+constexpr Conversion unsignedDecimal() {
+  Conversion c;
+  c.kind = Conversion::Kind::Unsigned;
+  return c;
+}
 constexpr Conversion fixed(double step, double origin, std::string_view unit) {
   Conversion c;
   c.kind = Conversion::Kind::Fixed;

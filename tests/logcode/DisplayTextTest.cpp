@@ -65,5 +65,23 @@ TEST(DisplayText, AUnitHoldsElevenCharactersAtMost) {
   EXPECT_TRUE(records::Unit().empty());
 }
 
+// "%u": a 32-bit field with its top bit set stays positive.
+TEST(DisplayText, AnUnsignedConversionShowsAll32BitsPositive) {
+  constexpr records::Conversion kUnsigned = records::unsignedDecimal();
+  EXPECT_EQ(conversionText(kUnsigned, 0xFFFFFFFF).view(), "4294967295");
+  EXPECT_EQ(conversionText(kUnsigned, 0).view(), "0");
+  EXPECT_EQ(conversionText(records::decimal(), 0xFFFFFFFF).view(), "-1");
+  EXPECT_EQ(kUnsigned.rawFor(4294967295.0), 0xFFFFFFFFu);
+}
+
+// A value table's texts are shown whole, however long.
+TEST(DisplayText, ATableTextLongerThanAMadeTextIsShownWhole) {
+  static constexpr records::ValueText kTexts[] = {{0, "Barred (PKT access not allowed in the Cell)"}};
+  constexpr records::Conversion kTable = records::valueTable(kTexts, "MM_WAIT_FOR_ADDITIONAL_OUTGOING_MM_ CONNECTION");
+  static_assert(std::string_view("Barred (PKT access not allowed in the Cell)").size() > Text::kCapacity);
+  EXPECT_EQ(conversionText(kTable, 0).view(), "Barred (PKT access not allowed in the Cell)");
+  EXPECT_EQ(conversionText(kTable, 1).view(), "MM_WAIT_FOR_ADDITIONAL_OUTGOING_MM_ CONNECTION");
+}
+
 }  // namespace
 }  // namespace corvane

@@ -162,9 +162,11 @@ TEST(GsmUmtsRadioEncoderTest, EachRecordIsSentOnlyWhereThePhoneIsAndAtItsCadence
     bool (*applies)(Phase phase, Access camped);
   };
   const std::vector<Cadence> cadences = {
-      {0x7132, 250, [](Phase, Access) { return true; }},
+      {0x7132, 25, [](Phase, Access) { return true; }},
       {0x7135, 125, [](Phase, Access) { return true; }},
       {0x7150, 250, [](Phase, Access) { return true; }},
+      {0x7131, 25, [](Phase, Access) { return true; }},
+      {0x7130, 25, [](Phase, Access) { return true; }},
       {0x4125, 50, [](Phase, Access a) { return a == Access::UMTS; }},
       {0x4127, 50, [](Phase, Access a) { return a == Access::UMTS; }},
       {0x4157, 50, [](Phase, Access a) { return a == Access::UMTS; }},
@@ -178,6 +180,14 @@ TEST(GsmUmtsRadioEncoderTest, EachRecordIsSentOnlyWhereThePhoneIsAndAtItsCadence
       {0x5137, 12, [](Phase, Access a) { return a == Access::GSM; }},
       {0x51F8, 50, [](Phase p, Access) { return p == Phase::GsmDedicated; }},
       {0x5076, 12, [](Phase p, Access) { return p == Phase::GsmDedicated; }},
+      {0x4221, 25, [](Phase p, Access) { return p == Phase::UmtsDch; }},
+      {0x512C, 50, [](Phase, Access a) { return a == Access::GSM; }},
+      {0x5072, 50, [](Phase, Access a) { return a == Access::GSM; }},
+      {0x51F4, 50, [](Phase, Access a) { return a == Access::GSM; }},
+      {0x51F5, 50, [](Phase, Access a) { return a == Access::GSM; }},
+      {0x51F6, 50, [](Phase, Access a) { return a == Access::GSM; }},
+      {0x51FB, 50, [](Phase, Access a) { return a == Access::GSM; }},
+      {0x51FD, 50, [](Phase, Access a) { return a == Access::GSM; }},
   };
   PeriodReader reader(kSeed);
   std::map<std::uint32_t, int> sent;
@@ -405,9 +415,11 @@ TEST(GsmUmtsRadioEncoderTest, EverySectionOfTheRecordsShowsValuesAtSomePoint) {
   // "Virtual Active Set" list no cell whatever the record holds, and the
   // non-ranked sets and "UMTS RR Measurement" take no records at all.
   const std::vector<std::string> rowSections = {"Serving PLMN", "GSM Serving Cell", "UMTS RR Info", "Mobile Allocation",
-                                                "BLER"};
-  const std::vector<std::string> listSections = {"Equivalent PLMN List", "Neighboring Cells", "Active Set", "UMTS Set",
-                                                 "GSM Set", "Transport Channels"};
+                                                "BLER",         "Process CO",       "Process CS",   "Process PS",
+                                                "GSM RR Info",  "GPRS Information", "HSDPA Info"};
+  const std::vector<std::string> listSections = {"Equivalent PLMN List", "Neighboring Cells",    "Active Set",
+                                                 "UMTS Set",             "GSM Set",              "Transport Channels",
+                                                 "Primary HARQ Process", "Secondary HARQ Process"};
   std::map<std::string, std::set<std::string>> filledRows;  // section -> rows seen with a value
   std::set<std::string> filledLists;
   std::map<std::string, std::set<std::string>> templateRows;
@@ -438,6 +450,171 @@ TEST(GsmUmtsRadioEncoderTest, EverySectionOfTheRecordsShowsValuesAtSomePoint) {
     EXPECT_GE(filledRows[section].size(), 2u) << section;
   }
   EXPECT_EQ(filledLists, std::set<std::string>(listSections.begin(), listSections.end()));
+}
+
+// --- Mobility management, GSM radio resource and HSDPA ---
+
+// The bytes of the first packet of a code in a period, if any.
+std::optional<Bytes> recordIn(const Period& period, std::uint32_t code) {
+  for (const SourcePacket& packet : period.packets) {
+    if (*packet.code == code) return *packet.data;
+  }
+  return std::nullopt;
+}
+
+// Read from the bytes: 0x7132's service state at 13; 0x7131's and 0x7130's
+// state, substate and update status at 13, 14 and 15; 0x512C's RR state at
+// 13 and mode at 16; 0x5072's DTX at 19.
+TEST(GsmUmtsRadioEncoderTest, MobilityStatesFollowTheJourneyWithAnAttachAndAnUpdateAtEachReselection) {
+  PeriodReader reader(kSeed);
+  std::optional<Access> camped;
+  int updates = 0, calls = 0, serviceRequests = 0, settled = 0;
+  bool updatingBefore = false;
+  for (;;) {
+    const Period period = reader.next();
+    if (period.number >= 120 * kPeriodsPerSecond) break;
+    SCOPED_TRACE("period " + std::to_string(period.number));
+    const SimulatedNetwork& network = period.network;
+    const Access access = network.servingCell().access;
+    const auto service = recordIn(period, 0x7132);
+    const auto mm = recordIn(period, 0x7131);
+    const auto gmm = recordIn(period, 0x7130);
+    const auto rr = recordIn(period, 0x512C);
+    if (period.number == 0) {
+      // The combined attach: MM waits for GMM, nothing updated yet.
+      ASSERT_TRUE(service && mm && gmm);
+      EXPECT_EQ((*service)[13], 2);                                             // REG_STATE_REGISTERING
+      EXPECT_EQ(Bytes(mm->begin() + 13, mm->end()), (Bytes{23, 5, 1}));       // LOCATION_UPDATING_PENDING
+      EXPECT_EQ(Bytes(gmm->begin() + 13, gmm->end()), (Bytes{2, 2, 1}));      // REGISTERED_INITIATED
+    } else if (camped && *camped != access) {
+      // A reselection to the other technology: a combined routing area update.
+      ++updates;
+      ASSERT_TRUE(service && mm && gmm);
+      EXPECT_EQ((*service)[13], 2);
+      EXPECT_EQ(Bytes(mm->begin() + 13, mm->end()), (Bytes{23, 8, 0}));
+      EXPECT_EQ(Bytes(gmm->begin() + 13, gmm->end()), (Bytes{5, 8, 1}));      // ROUTING_AREA_UPDATE_INITIATED
+      if (access == Access::GSM) {
+        ASSERT_TRUE(rr);
+        EXPECT_EQ((*rr)[13], 14);  // RR_W2G_INTERRAT_RESELECTION_PROGRESS
+      }
+      updatingBefore = true;
+    } else if (gmm) {
+      // Registered: the first state record after an update says so.
+      if (updatingBefore) ++settled;
+      updatingBefore = false;
+      ASSERT_TRUE(service && mm);
+      EXPECT_EQ((*service)[13], 1);  // REG_STATE_IDLE
+      EXPECT_EQ((*gmm)[15], 0);      // GMM_GU1_UPDATED
+      EXPECT_EQ((*mm)[15], 0);       // UPDATED
+      switch (network.phase()) {
+        case Phase::GsmDedicated:
+          ++calls;
+          EXPECT_TRUE((*mm)[13] == 6 || (*mm)[13] == 5) << int((*mm)[13]);  // a call: an MM connection
+          EXPECT_EQ((*gmm)[13], 3);
+          EXPECT_EQ((*gmm)[14], 7);  // GMM_SUSPENDED
+          break;
+        case Phase::UmtsConnecting:
+          ++serviceRequests;
+          EXPECT_EQ((*mm)[13], 19);
+          EXPECT_EQ((*gmm)[13], 6);  // GMM_SERVICE_REQUEST_INITIATED
+          break;
+        default:
+          EXPECT_EQ((*mm)[13], 19);  // MM_IDLE
+          EXPECT_EQ((*gmm)[13], 3);  // GMM_REGISTERED
+          EXPECT_EQ((*gmm)[14], 0);
+          break;
+      }
+    }
+    if (rr && !(camped && *camped != access)) {
+      const bool inCall = network.phase() == Phase::GsmDedicated;
+      EXPECT_EQ((*rr)[16], inCall ? 0 : 1);  // Voice in a call
+      if (inCall) {
+        EXPECT_TRUE((*rr)[13] == 9 || (*rr)[13] == 7) << int((*rr)[13]);
+      } else {
+        EXPECT_EQ((*rr)[13], 5);  // RR_IDLE
+      }
+    }
+    if (const auto dtx = recordIn(period, 0x5072)) {
+      EXPECT_EQ((*dtx)[19] != 0, network.phase() == Phase::GsmDedicated);
+    }
+    camped = access;
+  }
+  EXPECT_GE(updates, 3);
+  EXPECT_EQ(settled, updates);
+  EXPECT_GT(calls, 3);
+  EXPECT_GT(serviceRequests, 0);
+}
+
+// 0x4221 read from the bytes: p at 16 and s at 17, the carrier in bits 2-3
+// of 15, entries of 9 bytes from 18 and from 18 + 162 p, each with New Tx at
+// +5 and block errors at +7 (16 bits).
+TEST(GsmUmtsRadioEncoderTest, HsdpaCountsGrowThroughEachStayInDchAndStartAgainWithTheNext) {
+  PeriodReader reader(kSeed);
+  std::vector<std::uint32_t> previous;
+  std::uint64_t previousStay = 0;
+  int records = 0, stays = 0;
+  for (;;) {
+    const Period period = reader.next();
+    if (period.number >= 120 * kPeriodsPerSecond) break;
+    const auto record = recordIn(period, 0x4221);
+    if (!record) continue;
+    SCOPED_TRACE("period " + std::to_string(period.number));
+    ++records;
+    const Bytes& p = *record;
+    ASSERT_EQ(period.network.phase(), Phase::UmtsDch);
+    EXPECT_EQ(p[15] >> 2 & 3, 2);  // Dual Carrier
+    const std::size_t primary = p[16], secondary = p[17];
+    ASSERT_EQ(primary, 6u);
+    ASSERT_EQ(secondary, 6u);
+    ASSERT_EQ(p.size(), 18 + 162 * primary + 9 * secondary);
+    std::vector<std::uint32_t> newTx;
+    for (std::size_t i = 0; i < primary + secondary; ++i) {
+      const std::size_t at = i < primary ? 18 + 9 * i : 18 + 162 * primary + 9 * (i - primary);
+      EXPECT_EQ(p[at], i % primary);
+      const std::uint32_t fresh = p[at + 5] | p[at + 6] << 8;
+      const std::uint32_t errors = p[at + 7] | p[at + 8] << 8;
+      EXPECT_LT(errors, fresh / 3);
+      newTx.push_back(fresh);
+    }
+    const bool sameStay = !previous.empty() && period.network.phaseChanges() == previousStay;
+    stays += sameStay ? 0 : 1;
+    for (std::size_t i = 0; sameStay && i < newTx.size(); ++i) EXPECT_GT(newTx[i], previous[i]) << i;
+    for (std::size_t i = 0; !sameStay && i < newTx.size(); ++i) EXPECT_LT(newTx[i], 90u) << i;  // one record's worth
+    previous = newTx;
+    previousStay = period.network.phaseChanges();
+  }
+  EXPECT_GT(records, 10);
+  EXPECT_GE(stays, 2);
+}
+
+// The GSM RR info and GPRS information rows, through the decoder: the receive
+// level is the serving cell's, the GPRS parameters are the serving cell's own.
+TEST(GsmUmtsRadioEncoderTest, TheGsmRadioResourceAndGprsRowsFollowTheServingGsmCell) {
+  PeriodReader reader(kSeed);
+  GsmUmtsDecoder decoder;
+  int checks = 0;
+  for (;;) {
+    const Period period = reader.next();
+    if (period.number >= 120 * kPeriodsPerSecond) break;
+    decoder.feed(period);
+    const Cell& serving = period.network.servingCell();
+    if (serving.access != Access::GSM || !has(period, 0x51F6) || !has(period, 0x5137)) continue;
+    SCOPED_TRACE("period " + std::to_string(period.number));
+    ++checks;
+    const Value display = decoder.display();
+    EXPECT_EQ(rowText(display, "GSM RR Info", "Serving Rx Level"), number(-serving.level));
+    EXPECT_EQ(rowText(display, "GSM RR Info", "Rx Quality Full"), number(serving.level + 104));  // C1
+    EXPECT_EQ(rowText(display, "GSM RR Info", "DRX Used"), "2 sec");
+    EXPECT_EQ(rowText(display, "GPRS Information", "DRX Timer Max"), "2");
+    EXPECT_EQ(rowText(display, "GPRS Information", "Network Operating Mode"), "Class 1");
+    const char* t3192[] = {"500 ms", "80 ms", "1000 ms"};
+    EXPECT_EQ(rowText(display, "GPRS Information", "T3192"), t3192[serving.cellId % 3]);
+    EXPECT_EQ(rowText(display, "GPRS Information", "SI13 Position"),
+              serving.cellId % 4 == 3 ? "Located on Extended BCCH" : "Located on BCCH");
+    EXPECT_EQ(rowText(display, "GPRS Information", "Cell Reselect Hysteresis"),
+              serving.cellId % 2 == 0 ? "Applied" : "Not Applied");
+  }
+  EXPECT_GT(checks, 5);
 }
 
 // --- Determinism ---

@@ -54,10 +54,12 @@ TEST_F(GsmUmtsSampleDecode, EverySectionOfTheRecordsHoldsDecodedValues) {
   // whatever their record holds; the non-ranked sets and "UMTS RR
   // Measurement" take no records.
   const std::vector<std::string> rowSections = {"Serving PLMN", "GSM Serving Cell", "UMTS RR Info", "Mobile Allocation",
-                                                "BLER"};
-  const std::vector<std::string> listSections = {"Equivalent PLMN List", "Neighboring Cells", "Active Set",
-                                                 "UMTS Set",             "GSM Set",           "Transport Channels",
-                                                 "ARFCNs"};
+                                                "BLER",         "Process CO",       "Process CS",   "Process PS",
+                                                "GSM RR Info",  "GPRS Information", "HSDPA Info"};
+  const std::vector<std::string> listSections = {
+      "Equivalent PLMN List", "Neighboring Cells", "Active Set",           "UMTS Set",
+      "GSM Set",              "Transport Channels", "ARFCNs",              "Primary HARQ Process",
+      "Secondary HARQ Process"};
   for (const auto& name : rowSections) {
     std::vector<std::pair<std::string, std::string>> values;
     collectValues(section(name), "", values);
@@ -100,6 +102,23 @@ TEST_F(GsmUmtsSampleDecode, ThePhoneIsBackOnUmtsAndTheSectionsAgree) {
   EXPECT_GE(allocation.size(), 3u);
   EXPECT_NE(std::find(allocation.begin(), allocation.end(), gsm.at("MA Dedicated ARFCN")), allocation.end());
   EXPECT_EQ(gsm.at("RSSI").substr(gsm.at("RSSI").size() - 4), " dBm");
+  // Registered and idle again after the update of the last reselection;
+  // the GSM rows are those of the cell the phone left.
+  const auto cs = rowsOf(section("Process CS"));
+  const auto ps = rowsOf(section("Process PS"));
+  EXPECT_EQ(rowsOf(section("Process CO")).at("MM State"), "MM_IDLE");
+  EXPECT_EQ(cs.at("MM Service State"), "REG_STATE_IDLE");
+  EXPECT_EQ(cs.at("LU Reject Cause"), "UPDATED");
+  EXPECT_EQ(ps.at("MM State"), "GMM_REGISTERED");
+  EXPECT_EQ(ps.at("Attach Reject Cause"), "GMM_GU1_UPDATED");
+  const auto rr = rowsOf(section("GSM RR Info"));
+  EXPECT_EQ(rr.at("Serving Rx Level") + " dBm", gsm.at("RSSI"));
+  EXPECT_EQ(rr.at("DRX Used"), rowsOf(section("GPRS Information")).at("DRX Timer Max") + " sec");
+  // Dual carrier: six processes a carrier, their counts summed over the stay in DCH.
+  const auto hsdpa = rowsOf(section("HSDPA Info"));
+  EXPECT_EQ(hsdpa.at("Carrier Info"), "Dual Carrier");
+  EXPECT_EQ(section("Primary HARQ Process")["children"].size(), 6u);
+  EXPECT_EQ(section("Secondary HARQ Process")["children"].size(), 6u);
   for (const Json& row : section("Equivalent PLMN List")["children"]) {
     EXPECT_EQ(rowsOf(row).at("Mobile Country Code"), "1");
     EXPECT_EQ(rowsOf(row).at("Mobile Network Code"), "1");

@@ -2,16 +2,21 @@
 
 // 0x5137, the GSM cell measurement: the serving cell's level and its C1 and
 // C2 reselection criteria, then the measured neighbour cells. "GSM Serving
-// Cell" shows the serving cell, "Neighboring Cells" the neighbours.
+// Cell" shows the serving cell, "Neighboring Cells" the neighbours; "GSM RR
+// Info" shows the same serving-cell bytes as receive level and qualities, and
+// "GPRS Information" the reselection hysteresis.
 //
 //   15  u8    serving cell RSSI, dBm as an unsigned number
 //   16  le32  serving cell C1, signed
 //   20  le32  serving cell C2, signed
+//   26  u8    cell reselect hysteresis: 0 not applied, anything else applied
 //   28  u8    number of neighbours
 //   29        the neighbours, 14 bytes each:
 //               +0 le16 ARFCN, +2 u8 RSSI, +3 le32 C1 (signed),
 //               +7 to +13 not shown
 //   ..29      record length the decoder requires
+
+#include <array>
 
 #include "LogGenerator/records/SignedField.h"
 
@@ -29,6 +34,16 @@ inline constexpr records::SignedField kServingC2 = records::signedField(records:
 // unsigned number, so a C1 of -5 shows as 65531.
 inline constexpr records::Field kServingC1Shown = kServingC1.field.bits(0, 15);
 inline constexpr records::Field kServingC2Shown = kServingC2.field.bits(0, 15);
+
+// "GSM RR Info"'s reading of the same bytes: the level as a plain number, C1
+// and C2 whole, as "%d" of their 32 bits.
+inline constexpr records::Field kServingRxLevel = records::u8(15);
+inline constexpr records::Field kRxQualityFull = kServingC1.field;
+inline constexpr records::Field kRxQualitySub = kServingC2.field;
+
+inline constexpr std::array<records::ValueText, 1> kHysteresisNotApplied = {{{0, "Not Applied"}}};
+inline constexpr records::Field kCellReselectHysteresis =
+    records::u8(26).as(records::valueTable(kHysteresisNotApplied, "Applied"));
 
 inline constexpr records::Field kNeighborCount = records::u8(28);
 inline constexpr records::EntryList kNeighbors = {29, 14};

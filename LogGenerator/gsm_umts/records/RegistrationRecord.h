@@ -2,8 +2,9 @@
 
 // 0x7135, the registration: the network the phone is registered on, its
 // location and routing area, and the service it has there. "Serving PLMN"
-// shows it.
+// shows it; "GPRS Information" shows the network operating mode.
 //
+//   13  u8    network operating mode (mode table)
 //   14  u8    service type (service table)
 //   15  3 bytes PLMN identity, two BCD digits a byte, low nibble first:
 //         15  bits 0-3 MCC digit 1, bits 4-7 MCC digit 2
@@ -34,6 +35,12 @@ inline constexpr std::array<records::ValueText, 5> kServiceTypes = {{
     {4, "LIMITED_SERVICE"},
 }};
 
+inline constexpr std::array<records::ValueText, 3> kNetworkOperatingModes = {{
+    {0, "Class 1"},
+    {1, "Class 2"},
+    {2, "Class 3"},
+}};
+
 // A BCD digit shows as itself; a nibble of 10 or more (the 0xF filler of a
 // two-digit MNC among them) shows as a blank.
 inline constexpr std::array<records::ValueText, 10> kDigits = {{
@@ -41,6 +48,8 @@ inline constexpr std::array<records::ValueText, 10> kDigits = {{
 }};
 inline constexpr records::Conversion kDigit = records::valueTable(kDigits, " ");
 
+inline constexpr records::Field kNetworkOperatingMode =
+    records::u8(13).as(records::valueTable(kNetworkOperatingModes, "Unknown"));
 inline constexpr records::Field kServiceType = records::u8(14).as(records::valueTable(kServiceTypes, "Unknown"));
 
 // The identity's digits, each shown in the order of its code.
