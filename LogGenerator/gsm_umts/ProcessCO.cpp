@@ -1,8 +1,6 @@
 #include "LogGenerator/gsm_umts/ProcessCO.h"
 
-#include "LogGenerator/gsm_umts/MobilityRows.h"
 #include "LogGenerator/gsm_umts/records/MmStateRecord.h"
-#include "platform/Log.h"
 
 namespace corvane {
 
@@ -16,13 +14,7 @@ constexpr RowField kMmRows[] = {{"MM State", mm_state::kState}};
 
 void ProcessCO::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
   // The common part has always traced itself as the circuit-switched one.
-  log::write(log::kWarning, "ProcessCS");
-  const PacketView packet(data);
-  switch (logCode) {
-    case mm_state::kCode: writeRecordRows<kMmRows>(*this, packet, mm_state::kMinimumLength); return;
-    case plmn_selection::kCode: writeServiceState(*this, packet); return;
-    default: logUnknownCode(logCode); return;
-  }
+  updateStates<kMmRows>("ProcessCS", mm_state::kCode, mm_state::kMinimumLength, data, logCode);
 }
 
 }  // namespace corvane

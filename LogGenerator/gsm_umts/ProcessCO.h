@@ -3,11 +3,11 @@
 // "Process CO": the common part of mobility management, the MM state and the
 // registration service state.
 
-#include "LogGenerator/logcode/Base.h"
+#include "LogGenerator/gsm_umts/MobilityStateSection.h"
 
 namespace corvane {
 
-class ProcessCO final : public Base {
+class ProcessCO final : public MobilityStateSection {
  public:
   void updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) override;
 };

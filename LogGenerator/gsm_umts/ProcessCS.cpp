@@ -1,8 +1,6 @@
 #include "LogGenerator/gsm_umts/ProcessCS.h"
 
-#include "LogGenerator/gsm_umts/MobilityRows.h"
 #include "LogGenerator/gsm_umts/records/MmStateRecord.h"
-#include "platform/Log.h"
 
 namespace corvane {
 
@@ -20,13 +18,7 @@ constexpr RowField kMmRows[] = {
 }  // namespace
 
 void ProcessCS::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
-  log::write(log::kWarning, "ProcessCS");
-  const PacketView packet(data);
-  switch (logCode) {
-    case mm_state::kCode: writeRecordRows<kMmRows>(*this, packet, mm_state::kMinimumLength); return;
-    case plmn_selection::kCode: writeServiceState(*this, packet); return;
-    default: logUnknownCode(logCode); return;
-  }
+  updateStates<kMmRows>("ProcessCS", mm_state::kCode, mm_state::kMinimumLength, data, logCode);
 }
 
 }  // namespace corvane

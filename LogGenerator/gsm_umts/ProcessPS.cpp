@@ -1,8 +1,6 @@
 #include "LogGenerator/gsm_umts/ProcessPS.h"
 
-#include "LogGenerator/gsm_umts/MobilityRows.h"
 #include "LogGenerator/gsm_umts/records/GmmStateRecord.h"
-#include "platform/Log.h"
 
 namespace corvane {
 
@@ -21,13 +19,7 @@ constexpr RowField kGmmRows[] = {
 }  // namespace
 
 void ProcessPS::updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) {
-  log::write(log::kWarning, "ProcessPS");
-  const PacketView packet(data);
-  switch (logCode) {
-    case gmm_state::kCode: writeRecordRows<kGmmRows>(*this, packet, gmm_state::kMinimumLength); return;
-    case plmn_selection::kCode: writeServiceState(*this, packet); return;
-    default: logUnknownCode(logCode); return;
-  }
+  updateStates<kGmmRows>("ProcessPS", gmm_state::kCode, gmm_state::kMinimumLength, data, logCode);
 }
 
 }  // namespace corvane

@@ -5,11 +5,11 @@
 // section ("MM State", "MM Sub State") and "Attach Reject Cause", with the
 // registration service state.
 
-#include "LogGenerator/logcode/Base.h"
+#include "LogGenerator/gsm_umts/MobilityStateSection.h"
 
 namespace corvane {
 
-class ProcessPS final : public Base {
+class ProcessPS final : public MobilityStateSection {
  public:
   void updateWithData(std::span<const std::uint8_t> data, std::uint32_t logCode) override;
 };

@@ -345,6 +345,37 @@ class ScreenshotTest : public QObject {
       navigation->popViewControllerAnimated(false);
       QVERIFY(top()->tableView()->numberOfRows() >= 1);
       QVERIFY(keep(window, QStringLiteral("gsm-neighboring-cells-list")));
+
+      // Still on GSM: the radio resource layer and the cell's GPRS parameters.
+      QVERIFY(openSection(QStringLiteral("Radio Resource"), QStringLiteral("GSM RR Info")));
+      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), kJourney);
+      QVERIFY(valueOf(QStringLiteral("DRX Used")).endsWith(QStringLiteral(" sec")));
+      QVERIFY(keep(window, QStringLiteral("gsm-rr-info")));
+      QVERIFY(openSection(QStringLiteral("Packet Data"), QStringLiteral("GPRS Information")));
+      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), kJourney);
+      QVERIFY(keep(window, QStringLiteral("gsm-gprs-information")));
+
+      // A call on GSM: an MM connection, and GPRS suspended meanwhile.
+      QVERIFY(openSection(QStringLiteral("Mobility"), QStringLiteral("Process CS")));
+      QTRY_VERIFY2_WITH_TIMEOUT(decoded() && valueOf(QStringLiteral("MM State")) == QLatin1String("MM_CONNECTION_ACTIVE"),
+                                qPrintable(rowsText()), kJourney);
+      QVERIFY(keep(window, QStringLiteral("gsm-process-cs")));
+      QVERIFY(openSection(QStringLiteral("Mobility"), QStringLiteral("Process PS")));
+      QTRY_VERIFY2_WITH_TIMEOUT(decoded() && valueOf(QStringLiteral("MM Sub State")) == QLatin1String("GMM_SUSPENDED"),
+                                qPrintable(rowsText()), kJourney);
+      QVERIFY(keep(window, QStringLiteral("gsm-process-ps")));
+
+      // HSDPA from the last stay in CELL_DCH: its HARQ processes are list rows.
+      QVERIFY(openSection(QStringLiteral("Packet Data"), QStringLiteral("HSDPA Info")));
+      QTRY_VERIFY2_WITH_TIMEOUT(valueOf(QStringLiteral("Carrier Info")) == QLatin1String("Dual Carrier") &&
+                                    test::rowWithKey(top(), QStringLiteral("Secondary HARQ Process")) >= 0,
+                                qPrintable(rowsText()), kJourney);
+      QVERIFY(keep(window, QStringLiteral("gsm-hsdpa-info")));
+      QVERIFY(open(QStringLiteral("Primary HARQ Process")));
+      QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() == 6, qPrintable(rowsText()), 10000);
+      QVERIFY(open(QStringLiteral("0")));
+      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), 10000);
+      QVERIFY(keep(window, QStringLiteral("gsm-hsdpa-harq-process")));
     }
   }
 };
