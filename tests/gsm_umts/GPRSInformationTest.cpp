@@ -24,15 +24,6 @@ Bytes accessRecord(std::uint8_t pfc, std::uint8_t threshold, std::uint8_t order)
   return p;
 }
 
-// 0x51F6: T3192 at 15, the DRX timer at 16, the access burst type at 17; 24 bytes.
-Bytes cellOptionsRecord(std::uint8_t t3192, std::uint8_t drx = 0, std::uint8_t burst = 0) {
-  Bytes p = logPacket(0x51F6, 24);
-  p[15] = t3192;
-  p[16] = drx;
-  p[17] = burst;
-  return p;
-}
-
 // 0x51FD: PSI status 13, count LR 14, count HR 15, extended measurement order 16, SI status 33; 35 bytes.
 Bytes systemInfoRecord(std::size_t size = 35) {
   Bytes p = logPacket(0x51FD, size);
@@ -107,19 +98,19 @@ TEST_F(GprsInformation, TheNetworkOperatingModeIsByte13OfTheRegistration) {
 // Edge case: T3192 of 3 is "0 ms"; 9 is past the table.
 TEST_F(GprsInformation, AT3192Of3ShowsZeroMsAnd9ShowsQuestionMarks) {
   const Dictionary rows = attachRows();
-  feed(cellOptionsRecord(3), 0x51F6);
+  feed(test::gprsCellOptionsPacket(3), 0x51F6);
   EXPECT_EQ(test::rowText(rows, "T3192"), "0 ms");
-  feed(cellOptionsRecord(9), 0x51F6);
+  feed(test::gprsCellOptionsPacket(9), 0x51F6);
   EXPECT_EQ(test::rowText(rows, "T3192"), "?? ms");
 }
 
 // Edge case (this section's half): byte 16 = 4 shows "4".
 TEST_F(GprsInformation, TheCellOptionsShowT3192BurstTypeAndDrxTimer) {
   const Dictionary rows = attachRows();
-  feed(cellOptionsRecord(0, 4, 1), 0x51F6);
+  feed(test::gprsCellOptionsPacket(0, 4, 1), 0x51F6);
   EXPECT_EQ(Value(rows),
             D({{"T3192", S("500 ms")}, {"Access Burst Type", S("11-bit format")}, {"DRX Timer Max", S("4")}}));
-  feed(cellOptionsRecord(7, 0, 0), 0x51F6);
+  feed(test::gprsCellOptionsPacket(7, 0, 0), 0x51F6);
   EXPECT_EQ(Value(rows),
             D({{"T3192", S("200 ms")}, {"Access Burst Type", S("8-bit format")}, {"DRX Timer Max", S("0")}}));
 }

@@ -32,15 +32,6 @@ Bytes dtxRecord(std::uint8_t dtx) {
   return p;
 }
 
-// 0x51F6: T3192 at 15, the DRX timer at 16, the access burst type at 17; 24 bytes.
-Bytes cellOptionsRecord(std::uint8_t t3192, std::uint8_t drx, std::uint8_t burst) {
-  Bytes p = logPacket(0x51F6, 24);
-  p[15] = t3192;
-  p[16] = drx;
-  p[17] = burst;
-  return p;
-}
-
 TEST_F(GsmRrInfo, RegistersForItsFourCodesInOrder) {
   EXPECT_EQ(classDict.at("GSM RR Info"), section);
   EXPECT_EQ(section->getLogCodeArray(), (std::vector<std::uint32_t>{0x512C, 0x5137, 0x5072, 0x51F6}));
@@ -102,7 +93,7 @@ TEST_F(GsmRrInfo, DtxIsOnForAnyByteButZero) {
 // Edge case (this section's half): byte 16 of 0x51F6 = 4 shows "4 sec".
 TEST_F(GsmRrInfo, TheDrxTimerShowsInSeconds) {
   const Dictionary rows = attachRows();
-  feed(cellOptionsRecord(3, 4, 1), 0x51F6);
+  feed(test::gprsCellOptionsPacket(3, 4, 1), 0x51F6);
   EXPECT_EQ(Value(rows), D({{"DRX Used", S("4 sec")}}));
 }
 

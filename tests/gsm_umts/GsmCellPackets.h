@@ -1,7 +1,7 @@
 #pragma once
 
-// GSM cell records laid out by hand for the tests of "GSM Serving Cell" and
-// "Neighboring Cells".
+// GSM cell records laid out by hand for the tests of "GSM Serving Cell",
+// "Neighboring Cells", "GSM RR Info" and "GPRS Information".
 
 #include <cstdint>
 #include <vector>
@@ -34,6 +34,16 @@ inline Bytes gsmMeasurementPacket(std::uint8_t servingRssi, std::int32_t c1, std
     for (std::size_t unshown = 7; unshown < 14; ++unshown) p[at + unshown] = 0xEE;
     at += 14;
   }
+  return p;
+}
+
+// 0x51F6, the GPRS cell options: T3192 at 15, the DRX timer at 16, the
+// access burst type at 17; 24 bytes.
+inline Bytes gprsCellOptionsPacket(std::uint8_t t3192, std::uint8_t drx = 0, std::uint8_t burst = 0) {
+  Bytes p = logPacket(0x51F6, 24);
+  p[15] = t3192;
+  p[16] = drx;
+  p[17] = burst;
   return p;
 }
 

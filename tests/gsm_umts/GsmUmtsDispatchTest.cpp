@@ -138,10 +138,8 @@ TEST_F(GsmUmtsDispatch, AServiceStateReachesAllThreeMobilitySectionsInTheOrderOf
 // 0x51F6's byte 16 is the DRX in seconds and the DRX timer maximum.
 // Edge case: byte 16 = 4 shows "4 sec" and "4".
 TEST_F(GsmUmtsDispatch, TheGprsCellOptionsReachTheGprsInformationThenTheRadioResourceInfo) {
-  Bytes p = logPacket(0x51F6, 24);
-  p[16] = 4;
   log::ScopedCapture capture;
-  generator->updateWithData(p);
+  generator->updateWithData(test::gprsCellOptionsPacket(0, 4));
   EXPECT_EQ(warningTexts(capture), (std::vector<std::string>{"GPRSInformation", "GSMRRInfo"}));
   EXPECT_EQ(rowText("GPRS Information", "DRX Timer Max"), "4");
   EXPECT_EQ(rowText("GSM RR Info", "DRX Used"), "4 sec");
