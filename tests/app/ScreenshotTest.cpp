@@ -256,8 +256,8 @@ class ScreenshotTest : public QObject {
   // (DCH for the active set and the RRC state, GSM for the serving cell and
   // its neighbours), then kept as a picture.
   void theGsmUmtsScenarioShowsTheJourneyOnTheGsmAndUmtsScreens() {
-    // About 25 packets a second: some three simulated seconds for each real one.
-    LiveService service({"--technology", "Quendra_GSM", "--seed", "2", "--rate", "25"});
+    // About 35 packets a second: some three simulated seconds for each real one.
+    LiveService service({"--technology", "Quendra_GSM", "--seed", "2", "--rate", "35"});
     QVERIFY2(service.platform_, service.error_.c_str());
     QTRY_VERIFY_WITH_TIMEOUT(service.listening(), 10000);
 
