@@ -113,8 +113,9 @@ Value C2KLogGenerator::getDisplayFromState(const Dictionary& state) {
 
 void C2KLogGenerator::updateState(const Dictionary& state, std::span<const std::uint8_t> data) {
   getDisplayFromState(state);
-  const Value* lookup = state.find(kC2KStateLookup);
-  updateFromLog(data, lookup ? lookup->asDictionary() : nullptr, state);
+  // A handle of its own: the decoders add entries to the state, which may move its values.
+  const Value lookup = state.get(kC2KStateLookup);
+  updateFromLog(data, lookup.asDictionary(), state);
 }
 
 void C2KLogGenerator::updateFromLog(std::span<const std::uint8_t> data, const Dictionary* lookup,

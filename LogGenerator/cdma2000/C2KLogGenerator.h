@@ -57,5 +57,8 @@ class C2KLogGenerator final : public QNDLogGenerator {
 // into the rows' strings in place.
 void SetLookupValue(std::string_view key, std::string_view text, const Dictionary* lookup);
 void SetLookupValue(std::string_view key, const Value& value, const Dictionary* lookup);
+inline void SetLookupValue(std::string_view key, const char* text, const Dictionary* lookup) {
+  SetLookupValue(key, std::string_view(text), lookup);
+}
 
 }  // namespace corvane
