@@ -32,17 +32,19 @@ constexpr LinkKeys kReverse{kRLDataSeqNum, kRLDataSent,     "kRLDataRate",  "RLD
 // The steps of the sequence value are 1024 units of the bit total's time base.
 constexpr double kUnitsPerStep = 1024.0;
 
-const std::int64_t* integerIn(const Dictionary& state, std::string_view key) {
+std::optional<std::int64_t> integerIn(const Dictionary& state, std::string_view key) {
   const Value* v = state.find(key);
-  return v ? v->asInteger() : nullptr;
+  const std::int64_t* i = v ? v->asInteger() : nullptr;
+  return i ? std::optional<std::int64_t>(*i) : std::nullopt;
 }
 
 void updateRate(const LinkKeys& keys, std::uint32_t sequence, std::int64_t total, const Dictionary& state,
                 const Dictionary* lookup) {
-  const Value* extra = state.find(kStateExtraInfo);
-  const Dictionary* extraInfo = extra ? extra->asDictionary() : nullptr;
-  const std::int64_t* previousSequence = integerIn(state, keys.sequence);
-  const std::int64_t* previousTotal = integerIn(state, keys.sent);
+  // Handles and values of their own: setting entries of the state may move its values.
+  const Value extra = state.get(kStateExtraInfo);
+  const Dictionary* extraInfo = extra.asDictionary();
+  const std::optional<std::int64_t> previousSequence = integerIn(state, keys.sequence);
+  const std::optional<std::int64_t> previousTotal = integerIn(state, keys.sent);
   if (previousSequence && previousTotal) {
     const auto steps = static_cast<std::int32_t>(sequence - static_cast<std::uint32_t>(*previousSequence));
     if (steps >= 1) {
