@@ -46,12 +46,12 @@ Dictionary activeSetList(const PacketView& p, std::size_t at) {
   const std::uint32_t m = kPilotM.raw(p, at);
   const std::uint32_t referencePn = kReferencePn.raw(p, at);
   const std::size_t stride = pilotStride(m);
-  const std::size_t energyAt = pilotEnergyOffset(m);
+  const records::Field energy = pilotEnergy(m);
   for (std::size_t i = 0; i < count; ++i) {
     const std::size_t record = at + kFirstPilot + stride * i;
-    if (!p.covers(record, energyAt + 2)) break;
+    if (!p.covers(record, energy.end())) break;
     const std::uint32_t pn = kPilotPn.raw(p, record);
-    const double ecIo = activeSetEcIo(n, g, x, p.le16(record + energyAt));
+    const double ecIo = activeSetEcIo(n, g, x, energy.raw(p, record));
     const PrintedText key("%d;%d", static_cast<int>(i), static_cast<int>(pn));
     list.set(key, Value(pn == referencePn ? std::string_view(PrintedText("(ref pilot) %+.2f dB", ecIo))
                                           : std::string_view(PrintedText("%+.2f dB", ecIo))));

@@ -72,6 +72,7 @@ inline constexpr std::size_t kFirstPilot = 12;
 inline constexpr Field kPilotPn = le16(0);
 constexpr std::size_t pilotStride(std::uint32_t m) { return (6 * static_cast<std::size_t>(m) + 15) & ~std::size_t{3}; }
 constexpr std::size_t pilotEnergyOffset(std::uint32_t m) { return 12 + 4 * static_cast<std::size_t>(m); }
+constexpr Field pilotEnergy(std::uint32_t m) { return le16(pilotEnergyOffset(m)); }
 
 }  // namespace corvane::records::onex_status
 
