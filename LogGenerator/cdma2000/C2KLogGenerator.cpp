@@ -7,6 +7,7 @@
 #include "LogGenerator/cdma2000/records/FingerRecord.h"
 #include "LogGenerator/cdma2000/records/OneXSystemRecord.h"
 #include "LogGenerator/cdma2000/records/SubpacketRecord.h"
+#include "LogGenerator/logcode/ExtraCodePayloads.h"
 #include "LogGenerator/logcode/QNDLogGenerator2.h"
 #include "LogGenerator/logcode/TemplateResource.h"
 #include "platform/Log.h"
@@ -21,7 +22,6 @@ constexpr std::uint8_t kPrefixMarker = 0x81;
 constexpr std::size_t kPrefixSize = 2;
 constexpr std::uint8_t kTypeLogCode = 0x01;
 constexpr std::uint8_t kTypeExtraCode = 0xFF;
-constexpr std::uint32_t kExtraCodeBits = 0xFF0000;
 
 }  // namespace
 
@@ -127,7 +127,7 @@ void C2KLogGenerator::updateFromLog(std::span<const std::uint8_t> data, const Di
   // The type is reported but decides nothing: the code alone does.
   if (type != kTypeLogCode) log::printf(log::kError, "Invalid log type: %x. Dropping.", type);
   std::uint32_t code = packet.le16(3);
-  if (type == kTypeExtraCode) code |= kExtraCodeBits;
+  if (type == kTypeExtraCode) code |= kExtraCodeBase;
   const c2k::Decoder decoder = c2k::decoderFor(code);
   if (!decoder) return;
   decoder(data, state, lookup);

@@ -30,7 +30,6 @@ using scenario::kPeriodsPerSecond;
 using scenario::Period;
 constexpr std::uint64_t kStart = scenario::kScenarioStart;
 constexpr std::uint64_t kSeed = 4;
-constexpr std::uint32_t kExtraCodes = 0xFF0000;
 
 class PeriodReader : public scenario::PeriodReader {
  public:
@@ -48,7 +47,7 @@ class Decoded {
   void feed(const Period& period) {
     log::ScopedCapture quiet;
     for (const SourcePacket& packet : period.packets) {
-      if (*packet.code < kExtraCodes) generator_->updateState(state_, *packet.data);
+      if (*packet.code < kExtraCodeBase) generator_->updateState(state_, *packet.data);
     }
   }
   // The value under a lookup key: what its first row shows.
@@ -269,7 +268,7 @@ std::string sampleContents() {
     const Period period = reader.next();
     if (period.number >= kSampleSeconds * kPeriodsPerSecond) break;
     for (const SourcePacket& packet : period.packets) {
-      if (*packet.code < kExtraCodes) text += scenario::hexLine(*packet.data) + "\n";
+      if (*packet.code < kExtraCodeBase) text += scenario::hexLine(*packet.data) + "\n";
     }
   }
   return text;
