@@ -75,7 +75,14 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   const c2k::CodeDecoder& row = c2k::kDecoders[data[0] % std::size(c2k::kDecoders)];
   const std::span<const std::uint8_t> packet(data + 1, size - 1);
 
+  // The installed template, read once; each input gets a display of its own from it.
+  static const Value kTemplate = [] {
+    Dictionary first;
+    if (!C2KLogGenerator::getDisplayFromState(first).isDictionary()) std::abort();
+    return first.get("Template");
+  }();
   Dictionary state;
+  state.set("Template", kTemplate);
   if (!C2KLogGenerator::getDisplayFromState(state).isDictionary()) std::abort();
   const Value lookup = state.get("Lookup");
   const std::size_t entries = state.size();
