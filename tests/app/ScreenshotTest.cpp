@@ -382,7 +382,8 @@ class ScreenshotTest : public QObject {
       QVERIFY(openGroup(QStringLiteral("1x")));
       QTRY_VERIFY_WITH_TIMEOUT(valueOf(QStringLiteral("1x State")) == QLatin1String("Traffic [8]") &&
                                    valueOf(QStringLiteral("Tx AGC")).endsWith(QStringLiteral(" dBm")) &&
-                                   valueOf(QStringLiteral("Traffic FER")).endsWith(QLatin1Char('%')),
+                                   valueOf(QStringLiteral("Traffic FER")).endsWith(QLatin1Char('%')) &&
+                                   valueOf(QStringLiteral("Traffic FER")) != QLatin1String("0.00%"),
                                kJourney);
       QVERIFY(keep(window, QStringLiteral("cdma-1x")));
 
