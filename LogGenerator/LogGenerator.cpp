@@ -3,6 +3,7 @@
 #include <array>
 
 #include "LogGenerator/GSM/GSMLogGenerator.h"
+#include "LogGenerator/cdma2000/C2KLogGenerator.h"
 #include "LogGenerator/gsm_umts/QND_GSMLogGenerator.h"
 #include "LogGenerator/lte/LTELogGenerator.h"
 #include "LogGenerator/utran/UTRANLogGenerator.h"
@@ -22,6 +23,7 @@ struct TechnologyGenerator {
 // Searched in order; the first technology equal to the value wins.
 constexpr std::array kGeneratorsByTechnology = {
     TechnologyGenerator{kLogChannelTechnologyQuendraGSM, &QND_GSMLogGenerator::generator},
+    TechnologyGenerator{kLogChannelTechnologyQuendraCDMA, &C2KLogGenerator::generator},
     TechnologyGenerator{kLogChannelTechnologyQuendraLTE, &LTELogGenerator::generator},
     TechnologyGenerator{kLogChannelTechnologyQuendraUTRAN2, &UTRANLogGenerator::generator},
     TechnologyGenerator{kLogChannelTechnologyIFX, &GSMLogGenerator::generator},

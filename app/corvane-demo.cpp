@@ -216,7 +216,10 @@ int main(int argc, char** argv) {
   // The log-code scenarios send several records per simulated second; this
   // pace plays them at about real time (the service's default suits the IFX
   // scenario's one report per half second).
-  if (technology != "IFX") serviceArguments.insert(serviceArguments.end(), {"--rate", "10"});
+  // The CDMA phone's call adds a traffic frame every 80 ms: about twice as many.
+  if (technology != "IFX") {
+    serviceArguments.insert(serviceArguments.end(), {"--rate", technology == "Quendra_CDMA" ? "20" : "10"});
+  }
   const pid_t service = spawn(serviceArguments, environment, spawnError);
   if (service < 0) {
     cleanUp(-1);

@@ -31,6 +31,7 @@ inline constexpr std::string_view CellMonitorRadioAccessTechnologyGSM = "CellMon
 inline constexpr std::string_view CellMonitorRadioAccessTechnologyUMTS = "CellMonitorRadioAccessTechnologyUMTS";
 inline constexpr std::string_view CellMonitorRadioAccessTechnologyUTRAN2 = "CellMonitorRadioAccessTechnologyUTRAN2";
 inline constexpr std::string_view CellMonitorRadioAccessTechnologyLTE = "CellMonitorRadioAccessTechnologyLTE";
+inline constexpr std::string_view CellMonitorRadioAccessTechnologyCDMA = "CellMonitorRadioAccessTechnologyCDMA";
 
 // Values of CellMonitorCellType.
 inline constexpr std::string_view CellMonitorCellTypeServing = "CellMonitorCellTypeServing";

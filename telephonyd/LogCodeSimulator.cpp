@@ -3,6 +3,7 @@
 #include <stdexcept>
 
 #include "platform/LogChannelTechnology.h"
+#include "telephonyd/CdmaRadioEncoder.h"
 #include "telephonyd/GsmUmtsRadioEncoder.h"
 #include "telephonyd/LogRecord.h"
 #include "telephonyd/LteRadioEncoder.h"
@@ -25,7 +26,7 @@ constexpr std::uint64_t kMicrosecondsPerPeriod =
 
 bool isLogCodeTechnology(std::string_view technology) {
   return technology == kLogChannelTechnologyQuendraGSM || technology == kLogChannelTechnologyQuendraLTE ||
-         technology == kLogChannelTechnologyQuendraUTRAN2;
+         technology == kLogChannelTechnologyQuendraUTRAN2 || technology == kLogChannelTechnologyQuendraCDMA;
 }
 
 SourcePacket extraCodePacket(std::uint16_t n, std::uint64_t timestamp, const Value& payload) {
@@ -80,6 +81,7 @@ std::unique_ptr<LogCodeSimulator> makeLogCodeScenario(std::string_view technolog
   scenario->addEncoder(std::make_unique<ExtraCodeEncoder>());
   if (technology == kLogChannelTechnologyQuendraLTE) scenario->addEncoder(std::make_unique<LteRadioEncoder>());
   if (technology == kLogChannelTechnologyQuendraGSM) scenario->addEncoder(std::make_unique<GsmUmtsRadioEncoder>());
+  if (technology == kLogChannelTechnologyQuendraCDMA) scenario->addEncoder(std::make_unique<CdmaRadioEncoder>(seed));
   return scenario;
 }
 

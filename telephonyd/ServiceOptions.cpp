@@ -62,9 +62,10 @@ const ProgramUsage kProgram{
     "  -h, --help             show this help and exit\n"
     "  -V, --version          show the version and exit\n"
     "\n"
-    "IFX streams property-list reports. Quendra_GSM, Quendra_LTE and Quendra_UTRAN2\n"
-    "stream log records, only the codes that a channel's start command asks for:\n"
-    "so far the extra codes 0 (SIM files), 1 (cell list) and 2 (PDP contexts).\n"
+    "IFX streams property-list reports. Quendra_GSM, Quendra_LTE, Quendra_UTRAN2 and\n"
+    "Quendra_CDMA stream log records, only the codes that a channel's start command\n"
+    "asks for: the extra codes 0 (SIM files), 1 (cell list) and 2 (PDP contexts), and\n"
+    "the radio records of each technology (Quendra_CDMA: its eight 1x and EV-DO codes).\n"
     "\n"
     "Sockets live in $CORVANE_RUNTIME_DIR, else $XDG_RUNTIME_DIR/corvane, else /tmp/corvane-$UID.\n"
     "SIGTERM or SIGINT stop the service and remove its sockets.\n",

@@ -131,6 +131,7 @@ LevelRange levelRange(SimulatedNetwork::Access access) {
     case SimulatedNetwork::Access::LTE: return {-100, -40};
     case SimulatedNetwork::Access::UMTS:
     case SimulatedNetwork::Access::UTRAN2: return {-120, -50};
+    case SimulatedNetwork::Access::CDMA: return {-105, -55};
   }
   return {-120, -40};
 }
@@ -146,6 +147,7 @@ std::string_view accessValue(SimulatedNetwork::Access access) {
     case SimulatedNetwork::Access::UMTS: return CellMonitorRadioAccessTechnologyUMTS;
     case SimulatedNetwork::Access::UTRAN2: return CellMonitorRadioAccessTechnologyUTRAN2;
     case SimulatedNetwork::Access::LTE: return CellMonitorRadioAccessTechnologyLTE;
+    case SimulatedNetwork::Access::CDMA: return CellMonitorRadioAccessTechnologyCDMA;
   }
   return {};
 }
@@ -236,6 +238,8 @@ SimulatedNetwork::SimulatedNetwork(std::string_view technology, std::uint64_t se
     interRatNeighbours_.push_back({Access::UMTS, radio_.uniform(10562, 10838), radio_.uniform(0, 511), 1});
     interRatNeighbours_.push_back({Access::GSM, radio_.uniform(512, 885), radio_.uniform(0, 63), 0});
     nextDetection_ = static_cast<std::uint64_t>(detection_.uniform(kDetectionEveryLeast, kDetectionEveryMost));
+  } else if (technology == kLogChannelTechnologyQuendraCDMA) {
+    addCells(Access::CDMA, 6, areaCode);
   } else {
     throw std::invalid_argument("no simulated network for technology " + std::string(technology));
   }
@@ -402,9 +406,18 @@ void SimulatedNetwork::addCells(Access access, int count, int areaCode) {
       }
       break;
     }
+    case Access::CDMA: {
+      // One PCS (band class 1) carrier, on the 25-channel raster.
+      const int carrier = 25 * random_.uniform(1, 45);
+      for (int i = 0; i < count; ++i) {
+        channels.push_back(carrier);
+        bands.push_back(1);
+      }
+      break;
+    }
   }
 
-  const int codeLimit = access == Access::UMTS ? 511 : access == Access::UTRAN2 ? 127 : 503;
+  const int codeLimit = access == Access::UMTS || access == Access::CDMA ? 511 : access == Access::UTRAN2 ? 127 : 503;
   const int controller = random_.uniform(1, 4095);  // RNC of the UMTS/UTRAN2 cells, most of them
   const LevelRange range = levelRange(access);
   const bool first = cells_.empty();
@@ -423,6 +436,7 @@ void SimulatedNetwork::addCells(Access access, int count, int areaCode) {
         cell.cellId = (random_.oneIn(5) ? random_.uniform(1, 4095) : controller) << 16 | random_.uniform(1, 65535);
         break;
       case Access::LTE: cell.cellId = random_.uniform(1, 0xFFFFF) << 8 | random_.uniform(1, 3); break;
+      case Access::CDMA: cell.cellId = random_.uniform(1, 65535); break;  // the base id
     }
     if (access != Access::GSM) {
       // Distinct codes among the cells of one access technology, as planning requires.
@@ -449,8 +463,8 @@ void SimulatedNetwork::drift(Cell& cell) {
   const LevelRange range = levelRange(cell.access);
   const int stepSize = hasEvenLevel(cell.access) ? 2 * random_.uniform(-1, 1) : random_.uniform(-2, 2);
   cell.level = std::clamp(cell.level + stepSize, range.low, range.high);
-  if (cell.access == Access::UMTS || cell.access == Access::UTRAN2) {
-    // Ec/N0 follows the level, with some noise.
+  if (cell.access == Access::UMTS || cell.access == Access::UTRAN2 || cell.access == Access::CDMA) {
+    // Ec/N0 (a CDMA pilot's Ec/Io) follows the level, with some noise.
     cell.quality = std::clamp((cell.level + 60) / 4 - 2 + random_.uniform(-1, 1), -24, 0);
   }
   if (cell.access == Access::LTE) {
@@ -643,6 +657,15 @@ Dictionary SimulatedNetwork::cellFields(const Cell& cell) const {
       fields.set(CellMonitorUARFCN, Value::integer(cell.channel));
       fields.set(CellMonitorBandInfo, Value::integer(cell.band));
       fields.set(CellMonitorRSSI, measuredValue(cell.level / 2));
+      break;
+    case Access::CDMA:
+      fields.set(CellMonitorLAC, Value::integer(cell.areaCode));  // SID
+      fields.set(CellMonitorCellId, Value::integer(cell.cellId));  // base id
+      fields.set(CellMonitorARFCN, Value::integer(cell.channel));
+      fields.set(CellMonitorBandInfo, Value::integer(cell.band));
+      fields.set(CellMonitorPID, Value::integer(cell.code));  // PN offset
+      fields.set(CellMonitorRSSI, measuredValue(cell.level));
+      fields.set(CellMonitorECN0, measuredValue(cell.quality));
       break;
   }
   return fields;

@@ -13,6 +13,12 @@
 //                   GSM 900 neighbours
 //   Quendra_LTE     camped on LTE (band 3), with intra- and inter-frequency LTE
 //                   neighbours (band 3, 7, 20)
+//   Quendra_CDMA    CDMA2000 cell sites on one PCS (band class 1) carrier: the
+//                   cell list holds SID as CellMonitorLAC, the base id as
+//                   CellMonitorCellId, the channel as CellMonitorARFCN, the
+//                   PN offset as CellMonitorPID, the level as CellMonitorRSSI
+//                   and the pilot's Ec/Io as CellMonitorECN0; the phone's own
+//                   journey (1x idle, traffic, EV-DO) is telephonyd/CdmaSession.h
 // Every measurement period the levels take a random-walk step, quality follows
 // level, now and then a neighbour goes unmeasured, and a neighbour of the
 // serving cell's access technology that stays clearly stronger takes over. The
@@ -73,19 +79,19 @@ class SimulatedNetwork {
  public:
   static constexpr std::chrono::seconds kMeasurementPeriod{1};
 
-  enum class Access { GSM, UMTS, UTRAN2, LTE };
+  enum class Access { GSM, UMTS, UTRAN2, LTE, CDMA };
 
   struct Cell {
     Access access = Access::GSM;
     bool serving = false;
     int areaCode = 0;   // LAC; the TAC on LTE
     int cellId = 0;
-    int channel = 0;    // ARFCN (GSM), UARFCN (UMTS, UTRAN2) or E-ARFCN (LTE)
+    int channel = 0;    // ARFCN (GSM), UARFCN (UMTS, UTRAN2), E-ARFCN (LTE) or CDMA channel
     int band = 0;       // UMTS, UTRAN2 and LTE
     int code = 0;       // scrambling code (UMTS), cell parameter id (UTRAN2), physical cell id (LTE),
-                        // BSIC (GSM, on the GSM/UMTS network)
-    int level = 0;      // dBm: RSSI (GSM, LTE) or RSCP (UMTS, UTRAN2); GSM and LTE levels are even
-    int quality = 0;    // Ec/N0 in dB (UMTS, UTRAN2)
+                        // BSIC (GSM, on the GSM/UMTS network), pilot PN offset (CDMA)
+    int level = 0;      // dBm: RSSI (GSM, LTE, CDMA) or RSCP (UMTS, UTRAN2); GSM and LTE levels are even
+    int quality = 0;    // Ec/N0 in dB (UMTS, UTRAN2); the pilot's Ec/Io in dB (CDMA)
     bool measured = true;
     int strongerSteps = 0;  // consecutive steps clearly above the serving cell
 

@@ -19,6 +19,7 @@
 #include "CaptureReader.h"
 #include "LogGenerator/LogCodeTechnologies.h"
 #include "LogGenerator/LogGenerator.h"
+#include "LogGenerator/cdma2000/C2KDecoders.h"
 #include "LogGenerator/logcode/ClassIndex.h"
 #include "Progress.h"
 #include "ToolOptions.h"
@@ -103,14 +104,18 @@ bool isKnownTechnology(const std::string& name) {
   return false;
 }
 
-// The log codes that some section of a log-code technology reads; nothing
-// for the other technologies.
+// The log codes that some section or decoder of a log-code technology reads;
+// nothing for IFX.
 std::function<bool(std::uint32_t)> codesReadBy(const std::string& technology) {
   for (const corvane::LogCodeTechnology& t : corvane::logCodeTechnologies()) {
     if (t.technology != technology) continue;
     auto codes = std::make_shared<std::set<std::uint32_t>>();
     for (const corvane::SectionDescriptor& row : t.sections()) codes->insert(row.codes.begin(), row.codes.end());
     return [codes](std::uint32_t code) { return codes->count(code) != 0; };
+  }
+  // CDMA2000 has no sections: a decoder per code.
+  if (technology == corvane::kLogChannelTechnologyQuendraCDMA) {
+    return [](std::uint32_t code) { return corvane::c2k::decoderFor(code) != nullptr; };
   }
   return {};
 }

@@ -1,13 +1,10 @@
 #include "LogGenerator/logcode/QNDLogGenerator2.h"
 
 #include <charconv>
-#include <fstream>
-#include <iterator>
 
 #include "LogGenerator/logcode/ExtraCodePayloads.h"
+#include "LogGenerator/logcode/TemplateResource.h"
 #include "platform/Log.h"
-#include "platform/PropertyList.h"
-#include "platform/ResourceLocator.h"
 
 namespace corvane {
 
@@ -17,17 +14,6 @@ constexpr std::uint8_t kPrefixMarker = 0x81;
 constexpr std::size_t kPrefixSize = 2;
 constexpr std::uint8_t kTypeLogCode = 0x01;
 constexpr std::uint8_t kTypeExtraCode = 0xFF;
-
-std::optional<Dictionary> loadTemplate(const std::string& name) {
-  const auto path = resources::pathForResource(name, "plist");
-  if (!path) return std::nullopt;
-  std::ifstream in(*path, std::ios::binary);
-  if (!in) return std::nullopt;
-  const Bytes contents((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
-  auto parsed = plist::parse(contents);
-  if (!parsed || !parsed->isDictionary()) return std::nullopt;
-  return *parsed->asDictionary();
-}
 
 }  // namespace
 
@@ -123,7 +109,7 @@ Value QNDLogGenerator2::getDisplayFromState(const Dictionary& state) {
 
   Value templateObject = state.get(kStateTemplate);
   if (templateObject.isNull()) {
-    auto loaded = loadTemplate(pListName);
+    auto loaded = loadTemplateResource(pListName);
     if (!loaded) {
       log::printf(log::kError, "Cannot load template for display");
       return Value();

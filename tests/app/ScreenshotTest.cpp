@@ -378,6 +378,61 @@ class ScreenshotTest : public QObject {
       QVERIFY(keep(window, QStringLiteral("gsm-hsdpa-harq-process")));
     }
   }
+
+  // The CDMA2000 phone's journey on its screens: the 1x screen during the
+  // call, the EV-DO screen and the data rates during the data session.
+  void theCdmaScenarioShowsTheCallAndTheDataSession() {
+    LiveService service({"--technology", "Quendra_CDMA", "--seed", "4", "--rate", "40"});
+    QVERIFY2(service.platform_, service.error_.c_str());
+    QTRY_VERIFY_WITH_TIMEOUT(service.listening(), 10000);
+
+    Preferences preferences(service.configDirectory());
+    {
+      CorvaneApp app(CorvaneAppEnvironment{service.platform_->environment(), preferences, service.root_});
+      QVERIFY(launch(app));
+      QWidget* window = app.window();
+      NavigationController* navigation = app.navigationController();
+      auto top = [&] { return qobject_cast<CorvanePaneController*>(navigation->topViewController()); };
+      QTRY_VERIFY_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 4, 20000);
+      QCOMPARE(test::cellAt(top(), 0)->key->text(), QStringLiteral("Summary"));
+
+      auto openGroup = [&](const QString& group) {
+        navigation->popToViewController(navigation->viewControllers().front(), false);
+        const int row = test::rowWithKey(top(), group);
+        if (row < 0) return false;
+        test::tapRow(top(), row);
+        return true;
+      };
+      auto valueOf = [&](const QString& key) {
+        const int row = test::rowWithKey(top(), key);
+        return row < 0 || !test::cellAt(top(), row)->value ? QString() : test::cellAt(top(), row)->value->text();
+      };
+      // A whole journey at this pace, with room to spare.
+      constexpr int kJourney = 60000;
+
+      QVERIFY(openGroup(QStringLiteral("1x")));
+      QTRY_VERIFY_WITH_TIMEOUT(valueOf(QStringLiteral("1x State")) == QLatin1String("Traffic [8]") &&
+                                   valueOf(QStringLiteral("Tx AGC")).endsWith(QStringLiteral(" dBm")) &&
+                                   valueOf(QStringLiteral("Traffic FER")).endsWith(QLatin1Char('%')) &&
+                                   valueOf(QStringLiteral("Traffic FER")) != QLatin1String("0.00%"),
+                               kJourney);
+      QVERIFY(keep(window, QStringLiteral("cdma-1x")));
+
+      QVERIFY(openGroup(QStringLiteral("EV-DO")));
+      QTRY_VERIFY_WITH_TIMEOUT(valueOf(QStringLiteral("EV-DO State")) == QLatin1String("Connected [5]") &&
+                                   valueOf(QStringLiteral("Tx AGC")).endsWith(QStringLiteral(" dBm")),
+                               kJourney);
+      QVERIFY(valueOf(QStringLiteral("Serving PN Offset")).endsWith(QStringLiteral("64chips")));
+      QVERIFY(keep(window, QStringLiteral("cdma-evdo")));
+
+      QVERIFY(openGroup(QStringLiteral("Data Rates")));
+      QTRY_VERIFY_WITH_TIMEOUT(valueOf(QStringLiteral("Forward Link")).endsWith(QStringLiteral(" kbps")) &&
+                                   valueOf(QStringLiteral("Forward Link")) != QLatin1String("0.00 kbps"),
+                               kJourney);
+      QVERIFY(valueOf(QStringLiteral("Reverse Link")).endsWith(QStringLiteral(" kbps")));
+      QVERIFY(keep(window, QStringLiteral("cdma-data-rates")));
+    }
+  }
 };
 
 }  // namespace corvane

@@ -696,12 +696,6 @@ TEST_F(DaemonTest, HelpAndVersionNameTheProgramAndExitWithStatus0) {
   EXPECT_TRUE(serviceSockets(runtime_.path()).empty());
 }
 
-TEST_F(DaemonTest, TechnologyWithoutAScenarioIsAClearError) {
-  const auto result = test::runProcess({kDaemon, "--technology", "Quendra_CDMA"});
-  EXPECT_EQ(result.exitCode, 1);
-  EXPECT_EQ(result.err, "corvane-telephonyd: no simulator scenario for technology Quendra_CDMA yet\n");
-}
-
 TEST_F(DaemonTest, UnusableRuntimeDirectoryExitsWithStatus1AndOneLine) {
   test::TemporaryDirectory temporary;
   const std::string file = temporary.write("not-a-directory", "x");

@@ -173,9 +173,8 @@ TEST(LogCodeSimulatorTest, FurtherEncodersJoinTheScheduleInPeriodOrder) {
 
 TEST(LogCodeSimulatorTest, OnlyLogCodeTechnologiesHaveAScenario) {
   EXPECT_FALSE(makeLogCodeScenario(kLogChannelTechnologyIFX, 1, kStart));
-  EXPECT_FALSE(makeLogCodeScenario(kLogChannelTechnologyQuendraCDMA, 1, kStart));
-  for (auto technology :
-       {kLogChannelTechnologyQuendraGSM, kLogChannelTechnologyQuendraLTE, kLogChannelTechnologyQuendraUTRAN2}) {
+  for (auto technology : {kLogChannelTechnologyQuendraGSM, kLogChannelTechnologyQuendraLTE,
+                          kLogChannelTechnologyQuendraUTRAN2, kLogChannelTechnologyQuendraCDMA}) {
     auto scenario = makeLogCodeScenario(technology, 1, kStart);
     ASSERT_TRUE(scenario) << technology;
     EXPECT_EQ(scenario->technology(), technology);

@@ -597,7 +597,6 @@ TEST(SimulatedNetworkTest, SameSeedFindsTheSameLteCellsAndAnotherSeedOthers) {
 
 TEST(SimulatedNetworkTest, TechnologiesWithoutLogCodeCellsAreRefused) {
   EXPECT_THROW(SimulatedNetwork(kLogChannelTechnologyIFX, 1), std::invalid_argument);
-  EXPECT_THROW(SimulatedNetwork(kLogChannelTechnologyQuendraCDMA, 1), std::invalid_argument);
 }
 
 }  // namespace

@@ -179,12 +179,11 @@ TEST(FramedCapture, RandomBytesAreNoCapture) {
   EXPECT_NE(r.err.find("say which with --input-format"), std::string::npos) << r.err;
 }
 
-TEST(FramedCapture, ATechnologyWithoutADecoderIsSaidBeforeAnyInputIsRead) {
+TEST(FramedCapture, EveryTechnologyHasADecoderSoOnlyTheMissingInputIsReported) {
   const auto r = test::runProcess({kDecode, "-t", "Quendra_CDMA", "/nonexistent/capture.bin"});
   EXPECT_EQ(r.exitCode, 1);
-  EXPECT_EQ(r.err,
-            "corvane-decode: no decoder for technology \"Quendra_CDMA\" in this version; these have one: "
-            "IFX, Quendra_GSM, Quendra_LTE, Quendra_UTRAN2\n");
+  EXPECT_EQ(r.err.find("no decoder"), std::string::npos) << r.err;
+  EXPECT_NE(r.err.find("/nonexistent/capture.bin"), std::string::npos) << r.err;
 }
 
 TEST(FramedCapture, ADlfDamagedInTheMiddleIsDecodedUpToTheDamageWhichIsNamed) {
