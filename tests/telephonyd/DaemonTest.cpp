@@ -337,8 +337,9 @@ TEST_F(DaemonTest, LogCodePacketsTravelToTheDecodeToolsReadersAndDecoderUnchange
   EXPECT_EQ(effectiveCode(packets[0]), 0xFF0000u);
   EXPECT_EQ(effectiveCode(packets[1]), 0xFF0001u);
   EXPECT_EQ(effectiveCode(packets[2]), 0xFF0002u);
+  // 1800000000 s since 1970 is 1484035200 s, 1 187 228 160 000 ticks of 1.25 ms, since 1980-01-06.
   EXPECT_EQ(Bytes(packets[0].begin() + 5, packets[0].begin() + 13),
-            (Bytes{0x00, 0x80, 0x98, 0x28, 0x17, 0x65, 0x06, 0x00}));  // 1 800 000 000 000 000 us
+            (Bytes{0x00, 0x00, 0x00, 0x10, 0x50, 0x6C, 0x14, 0x01}));
 
   tools::InputError error;
   // As hex text, one packet per line.
