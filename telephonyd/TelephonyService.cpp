@@ -46,7 +46,19 @@ Bytes serviceReply(std::int32_t domain, std::int32_t code, const std::string& re
 
 TelephonyService::TelephonyService(SocketPortSystem& ports, RunLoop& runLoop, std::unique_ptr<PacketSource> source,
                                    Settings settings)
-    : ports_(ports), runLoop_(runLoop), source_(std::move(source)), settings_(settings) {}
+    : ports_(ports), runLoop_(runLoop), source_(std::move(source)), settings_(settings) {
+  if (source_->keepsTime()) {
+    pacer_ = std::make_unique<PacketPacer>(
+        runLoop_, *source_,
+        [this](const SourcePacket& packet) {
+          for (auto& [name, channel] : channels_) offer(*channel, packet);
+        },
+        [this] {
+          for (auto& [name, channel] : channels_) flush(*channel);
+          if (!anyoneStreaming()) pacer_->pause();
+        });
+  }
+}
 
 TelephonyService::~TelephonyService() {
   stop();
@@ -74,6 +86,7 @@ void TelephonyService::stop() {
   for (const auto& name : names) endChannel(name, "the service is stopping");
   if (pacedTimer_) runLoop_.cancel(pacedTimer_);
   pacedTimer_ = 0;
+  if (pacer_) pacer_->pause();
   if (servicePort_) {
     servicePort_->invalidate();
     servicePort_.reset();
@@ -249,7 +262,21 @@ bool TelephonyService::flush(Channel& channel) {
   return progress;
 }
 
+void TelephonyService::retryProductionSoon() {
+  if (pumpScheduled_) return;
+  pumpScheduled_ = true;
+  std::weak_ptr<bool> alive = alive_;
+  runLoop_.dispatchAfter(PacketPacer::kRetry, [this, alive] {
+    if (!alive.expired()) pumpAtFullSpeed();
+  });
+}
+
 void TelephonyService::ensureProduction() {
+  if (sourceEnded_) return;
+  if (pacer_) {
+    pacer_->resume();
+    return;
+  }
   if (settings_.rate > 0) {
     if (pacedTimer_) return;
     pacedStart_ = runLoop_.now();
@@ -285,12 +312,27 @@ void TelephonyService::producePaced() {
     pacedProduced_ = due - kMaximumCatchUp;
     count = kMaximumCatchUp;
   }
-  for (std::uint64_t i = 0; i < count; ++i) {
+  // A source that has nothing yet makes up for it at the next tick.
+  pacedProduced_ += produce(count);
+  for (auto& [name, channel] : channels_) flush(*channel);
+  if (sourceEnded_) {
+    runLoop_.cancel(pacedTimer_);
+    pacedTimer_ = 0;
+  }
+}
+
+std::uint64_t TelephonyService::produce(std::uint64_t most) {
+  std::uint64_t made = 0;
+  for (; made < most; ++made) {
+    const PacketSource::Availability availability = source_->availability();
+    if (availability != PacketSource::Availability::Ready) {
+      sourceEnded_ = availability == PacketSource::Availability::Ended;
+      break;
+    }
     const SourcePacket packet = source_->nextPacket();
-    ++pacedProduced_;
     for (auto& [name, channel] : channels_) offer(*channel, packet);
   }
-  for (auto& [name, channel] : channels_) flush(*channel);
+  return made;
 }
 
 void TelephonyService::pumpAtFullSpeed() {
@@ -314,12 +356,15 @@ void TelephonyService::pumpAtFullSpeed() {
       if (!channel->queue.empty()) blocked.push_back({channel->delivery->descriptor(), POLLOUT, 0});
     }
     if (!anyWanting && blocked.empty()) return;  // nothing left to send: stop until a new start
-    if (anyWanting && shortestQueue < kFullSpeedBatch) {
-      for (std::size_t i = 0; i < kFullSpeedBatch; ++i) {
-        const SourcePacket packet = source_->nextPacket();
-        for (auto& [name, channel] : channels_) offer(*channel, packet);
+    if (anyWanting && shortestQueue < kFullSpeedBatch && !sourceEnded_) {
+      if (produce(kFullSpeedBatch) > 0) continue;
+      if (blocked.empty()) {
+        // The source has nothing yet (or has ended, and stays so).
+        if (!sourceEnded_) retryProductionSoon();
+        return;
       }
-      continue;
+    } else if (blocked.empty()) {
+      return;  // the source has ended and everything has gone
     }
     const auto now = std::chrono::steady_clock::now();
     if (!progress && !blocked.empty()) {

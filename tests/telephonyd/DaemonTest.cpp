@@ -29,6 +29,7 @@
 #include "platform/Version.h"
 #include "platform/VirtualRunLoop.h"
 #include "support/LogRecords.h"
+#include "telephonyd/LogRecord.h"
 #include "support/Process.h"
 #include "transport/RawPeer.h"
 #include "transport/RuntimeTestDirectory.h"
@@ -720,6 +721,115 @@ TEST_F(DaemonTest, RuntimeDirectoryThatIsASymbolicLinkIsRefusedAsSuch) {
   EXPECT_EQ(result.err, "corvane-telephonyd: runtime directory " + link +
                             " is a symbolic link, which is not followed; remove the link so that the directory is "
                             "made afresh, or set CORVANE_RUNTIME_DIR to a private directory\n");
+  EXPECT_TRUE(serviceSockets(runtime_.path()).empty());
+}
+
+// --- Replaying a capture ---
+
+// A DLF of `count` records, `ticks` apart (1.25 ms each): LTE serving-cell
+// measurements (0xB17F) and identities (0xB0C1) in turn, and every fifth a
+// cell list (extra code 1). Each record's payload holds its number.
+std::string replayCapture(int count, std::uint64_t ticks, std::vector<Bytes>& packets) {
+  std::string dlf;
+  for (int i = 0; i < count; ++i) {
+    const std::uint64_t timestamp = (1'000'000 + static_cast<std::uint64_t>(i) * ticks) << 16;
+    Bytes packet;
+    if (i % 5 == 4) {
+      Array cells;
+      cells.append(Value::integer(i));
+      packet = telephonyd::encodeExtraCodePacket(1, timestamp, Value(cells));
+    } else {
+      const Bytes payload{static_cast<std::uint8_t>(i), static_cast<std::uint8_t>(i >> 8)};
+      packet = telephonyd::encodeLogPacket(i % 2 == 0 ? 0xB17F : 0xB0C1, timestamp, payload);
+    }
+    dlf.append(packet.begin() + 1, packet.end());
+    packets.push_back(std::move(packet));
+  }
+  return dlf;
+}
+
+TEST_F(DaemonTest, ReplayStreamsOnlyTheCapturesPacketsThatTheStartCommandAsksForInTheirOrder) {
+  test::TemporaryDirectory files;
+  std::vector<Bytes> packets;
+  const std::string capture = files.write("lte.dlf", replayCapture(3000, 1, packets));
+  Daemon daemon(ports_, {"--replay", capture, "--as-fast-as-possible"});
+  Client client(ports_, loop_);
+  ASSERT_TRUE(client.connected());
+  // The technology is the capture's: its log codes are LTE's.
+  EXPECT_EQ(client.technology(), "Quendra_LTE");
+  client.keepAll_ = true;
+  ASSERT_EQ(client.start(logCodeStart({0xB17F}, {1})), kPortSuccess);
+  std::vector<Bytes> expected;
+  for (std::size_t i = 0; i < packets.size(); ++i) {
+    if (i % 5 == 4 || i % 2 == 0) expected.push_back(packets[i]);
+  }
+  ASSERT_TRUE(pumpUntil([&] { return client.all_.size() >= expected.size(); }, 10000ms)) << client.all_.size();
+  pumpFor(100ms);
+  EXPECT_EQ(client.all_, expected);
+  EXPECT_TRUE(std::all_of(client.ids_.begin(), client.ids_.end(), [](MessageId id) { return id == 0; }));
+  // Played once: the service stays, with its channel open and answering.
+  EXPECT_TRUE(daemon.running());
+  EXPECT_EQ(client.technology(), "Quendra_LTE");
+}
+
+TEST_F(DaemonTest, ReplayFollowsTheRecordsTimestampsAndItsSpeed) {
+  test::TemporaryDirectory files;
+  std::vector<Bytes> packets;
+  // Six records 200 ms apart (160 ticks): the last is due 1 s after the first.
+  const std::string capture = files.write("paced.dlf", replayCapture(6, 160, packets));
+  for (const char* speed : {"1", "4"}) {
+    Daemon daemon(ports_, {"--replay", capture, "--speed", speed});
+    Client client(ports_, loop_);
+    ASSERT_TRUE(client.connected());
+    client.keepAll_ = true;
+    ASSERT_EQ(client.start(logCodeStart({0xB17F, 0xB0C1}, {1})), kPortSuccess);
+    ASSERT_TRUE(pumpUntil([&] { return !client.all_.empty(); }));
+    const auto first = Clock::now();
+    ASSERT_TRUE(pumpUntil([&] { return client.all_.size() == 6; }, 5000ms));
+    const auto took = Clock::now() - first;
+    EXPECT_EQ(client.all_, packets);
+    if (std::string(speed) == "1") {
+      EXPECT_GE(took, 950ms);
+      EXPECT_LT(took, 2500ms);
+    } else {
+      EXPECT_GE(took, 230ms);
+      EXPECT_LT(took, 900ms);
+    }
+  }
+}
+
+TEST_F(DaemonTest, ReplayInALoopStartsTheCaptureAgain) {
+  test::TemporaryDirectory files;
+  std::vector<Bytes> packets;
+  const std::string capture = files.write("loop.dlf", replayCapture(10, 1, packets));
+  Daemon daemon(ports_, {"--replay", capture, "--loop", "--as-fast-as-possible", "--packets", "35"});
+  Client client(ports_, loop_);
+  ASSERT_TRUE(client.connected());
+  client.keepAll_ = true;
+  ASSERT_EQ(client.start(logCodeStart({0xB17F, 0xB0C1}, {1})), kPortSuccess);
+  ASSERT_TRUE(pumpUntil([&] { return client.all_.size() >= 35; }));
+  for (std::size_t i = 0; i < 35; ++i) EXPECT_EQ(client.all_[i], packets[i % 10]) << i;
+}
+
+TEST_F(DaemonTest, ReplayOfACaptureThatCannotBeReadOrToldExitsWithStatus1AndOneLine) {
+  test::TemporaryDirectory files;
+  const auto missing = test::runProcess({kDaemon, "--replay", files.path() + "/missing.dlf"});
+  EXPECT_EQ(missing.exitCode, 1);
+  EXPECT_EQ(missing.err,
+            "corvane-telephonyd: " + files.path() + "/missing.dlf: cannot open: No such file or directory\n");
+  // Only the service's own extra codes: no technology to tell.
+  std::vector<Bytes> packets;
+  std::string extraOnly;
+  for (int i = 0; i < 3; ++i) {
+    const Bytes packet = telephonyd::encodeExtraCodePacket(1, static_cast<std::uint64_t>(i) << 16, Value(Array{}));
+    extraOnly.append(packet.begin() + 1, packet.end());
+  }
+  const std::string capture = files.write("extra.dlf", extraOnly);
+  const auto untold = test::runProcess({kDaemon, "--replay", capture});
+  EXPECT_EQ(untold.exitCode, 1);
+  EXPECT_EQ(untold.err, "corvane-telephonyd: cannot tell the technology of " + capture +
+                            ": it holds no log records, only the service's own extra codes; give it with "
+                            "--technology NAME\n");
   EXPECT_TRUE(serviceSockets(runtime_.path()).empty());
 }
 
