@@ -2,13 +2,25 @@
 # Corvane's main job: builds the application and the telephony service and runs
 # the demo: the service with its built-in simulator, and the application
 # connected to it, until the application quits (or Ctrl-C). Extra arguments go
-# to corvane-demo (e.g. --seed 7). Without a display, run it under
-# xvfb-run -a, or use --headless.
+# to corvane-demo (e.g. --seed 7, or --replay FILE to play a capture instead).
+# Without a display, run it under xvfb-run -a, or use --headless.
 #
-#   bash scripts/run.sh --headless [ARGS]   the service and corvane-monitor for
+#   bash scripts/run.sh --headless [--replay FILE] [ARGS]
+#                                           the service (simulating IFX, or
+#                                           playing FILE) and corvane-monitor for
 #                                           three display updates, as text
 #                                           (ARGS go to corvane-monitor)
 set -euo pipefail
+# A capture named relative to where this was started, before moving to the repository.
+args=()
+while [ $# -gt 0 ]; do
+  case "$1" in
+    --replay) args+=("$1"); shift; [ $# -gt 0 ] && { args+=("$(realpath -m -- "$1")"); shift; } ;;
+    --replay=*) args+=("--replay=$(realpath -m -- "${1#--replay=}")"); shift ;;
+    *) args+=("$1"); shift ;;
+  esac
+done
+set -- ${args[@]+"${args[@]}"}
 cd "$(dirname "$0")/.."
 bash scripts/deps.sh
 cmake -S . -B build/release -G Ninja -DCMAKE_BUILD_TYPE=Release -DCORVANE_TESTS=OFF -DCORVANE_BENCH=OFF >/dev/null
@@ -19,7 +31,12 @@ if [ "${1:-}" = "--headless" ]; then
   # A private runtime directory, so that this run never meets another service.
   export CORVANE_RUNTIME_DIR
   CORVANE_RUNTIME_DIR=$(mktemp -d /tmp/corvane-run-XXXXXX)
-  build/release/telephonyd/corvane-telephonyd --technology IFX &
+  service_args=(--technology IFX)
+  if [ "${1:-}" = "--replay" ] && [ $# -ge 2 ]; then
+    service_args=(--replay "$2")
+    shift 2
+  fi
+  build/release/telephonyd/corvane-telephonyd "${service_args[@]}" &
   service=$!
   trap 'kill "$service" 2>/dev/null; wait "$service" 2>/dev/null; rm -rf "$CORVANE_RUNTIME_DIR"' EXIT
   [ $# -gt 0 ] || set -- --updates 3
