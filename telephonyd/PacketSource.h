@@ -1,10 +1,11 @@
 #pragma once
 
-// Where the service's packets come from: the built-in simulator, or a
-// replayed capture file.
+// Where the service's packets come from: the built-in simulator, a replayed
+// capture file, or a live baseband's diagnostic port.
 
 #include <chrono>
 #include <cstdint>
+#include <functional>
 #include <memory>
 #include <optional>
 #include <set>
@@ -49,6 +50,15 @@ class PacketSource {
   // replayed capture's timestamps do; otherwise the service paces them at its
   // rate.
   virtual bool keepsTime() const { return false; }
+
+  // A live source (a baseband's diagnostic port) has packets when they come:
+  // it calls the handler on the run loop whenever new ones are ready, and the
+  // service takes them at once. Other sources never call it.
+  virtual bool isLive() const { return false; }
+  virtual void setArrivalHandler(std::function<void()> /*arrived*/) {}
+  // The log codes that the streaming channels ask for, all together, each time
+  // that changes; a live source asks its baseband for just those.
+  virtual void setWantedCodes(const std::set<std::uint32_t>& /*logCodes*/) {}
 };
 
 // The packets one channel asked for in its start command: packets without a

@@ -49,9 +49,10 @@ bool parseRate(const char* text, double& rate) {
 const ProgramUsage kProgram{
     "corvane-telephonyd",
     "Usage: corvane-telephonyd [OPTION]...\n"
-    "       corvane-telephonyd --replay FILE [--technology NAME] [--speed X | --as-fast-as-possible] [--loop]\n",
+    "       corvane-telephonyd --replay FILE [--technology NAME] [--speed X | --as-fast-as-possible] [--loop]\n"
+    "       corvane-telephonyd --diag DEVICE --technology NAME\n",
     "Serve network-monitor log channels to Corvane from the built-in simulator,\n"
-    "or from a capture file played back.\n"
+    "from a capture file played back, or from a baseband's diagnostic port.\n"
     "\n"
     "  -t, --technology NAME  technology to simulate (default IFX); with --replay,\n"
     "                         the capture's (default: told by its log codes)\n"
@@ -72,6 +73,11 @@ const ProgramUsage kProgram{
     "                         play as fast as the clients take the packets\n"
     "      --loop             start the capture again after its end (default: play\n"
     "                         it once, then keep the channels open, sending nothing)\n"
+    "      --diag DEVICE      bridge a baseband's diagnostic port (a USB serial tty,\n"
+    "                         or a WWAN diagnostic device such as /dev/wwan0qcdm0):\n"
+    "                         the log codes the channels ask for become its log\n"
+    "                         mask, and its log records their packets; needs\n"
+    "                         --technology, the decoder the baseband's codes are for\n"
     "      --log-stderr       copy log lines to standard error\n"
     "  -h, --help             show this help and exit\n"
     "  -V, --version          show the version and exit\n"
@@ -94,8 +100,9 @@ ParsedOptions parseServiceOptions(int argc, char** argv) {
       {"technology", 't', true},  {"seed", 's', true},        {"rate", 'r', true},
       {"packets", 'n', true},     {"clock-start", 0, true},   {"log-stderr", 0, false},
       {"replay", 0, true},        {"speed", 0, true},         {"as-fast-as-possible", 0, false},
-      {"loop", 0, false},
+      {"loop", 0, false},         {"diag", 0, true},
   };
+  bool rateGiven = false;
   bool seedGiven = false;
   bool speedGiven = false;
   ParsedOptions parsed;
@@ -120,6 +127,11 @@ ParsedOptions parseServiceOptions(int argc, char** argv) {
         }
         if (name == "as-fast-as-possible") options.asFastAsPossible = true;
         if (name == "loop") options.loop = true;
+        if (name == "rate") rateGiven = true;
+        if (name == "diag") {
+          if (!*value) return std::string("--diag needs a device");
+          options.diag = value;
+        }
         if (name == "rate" && !parseRate(value, options.rate)) {
           return "invalid rate '" + std::string(value) + "': give packets per second, or 0 or max";
         }
@@ -153,6 +165,19 @@ ParsedOptions parseServiceOptions(int argc, char** argv) {
   }
 
   const ServiceOptions& options = parsed.options;
+  if (options.diag) {
+    if (options.replay) return failure("give --diag or --replay, not both");
+    if (!options.technologyGiven) {
+      return failure("--diag needs --technology NAME: the baseband does not say which decoder its log codes are for");
+    }
+    if (options.technology == kLogChannelTechnologyIFX) {
+      return failure("--diag bridges log-code basebands; IFX is not one");
+    }
+    if (seedGiven || options.clockStart || rateGiven) {
+      return failure(std::string(seedGiven ? "--seed" : options.clockStart ? "--clock-start" : "--rate") +
+                     " is for the simulator, not for --diag");
+    }
+  }
   if (!options.replay) {
     if (speedGiven) return failure("--speed is for --replay");
     if (options.asFastAsPossible) return failure("--as-fast-as-possible is for --replay");

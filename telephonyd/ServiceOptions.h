@@ -28,6 +28,9 @@ struct ServiceOptions {
   double speed = 1.0;
   bool asFastAsPossible = false;
   bool loop = false;
+
+  // A baseband's diagnostic port to bridge instead of simulating.
+  std::optional<std::string> diag;
 };
 
 struct ParsedOptions {

@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <chrono>
 #include <cmath>
+#include <limits>
 #include <utility>
 
 #include "platform/Log.h"
@@ -31,6 +32,8 @@ constexpr std::size_t kFullSpeedBatch = 1024;
 constexpr auto kFullSpeedSlice = 5ms;
 // Most packets made in one paced tick after the loop was held up.
 constexpr std::uint64_t kMaximumCatchUp = 10000;
+// A live source's packets that a client could not take yet are offered again after this.
+constexpr auto kLiveFlushRetry = 5ms;
 // Messages handed to one batched send.
 constexpr std::size_t kMessagesPerFlush = 2048;
 
@@ -47,6 +50,12 @@ Bytes serviceReply(std::int32_t domain, std::int32_t code, const std::string& re
 TelephonyService::TelephonyService(SocketPortSystem& ports, RunLoop& runLoop, std::unique_ptr<PacketSource> source,
                                    Settings settings)
     : ports_(ports), runLoop_(runLoop), source_(std::move(source)), settings_(settings) {
+  if (source_->isLive()) {
+    std::weak_ptr<bool> alive = alive_;
+    source_->setArrivalHandler([this, alive] {
+      if (!alive.expired()) produceLive();
+    });
+  }
   if (source_->keepsTime()) {
     pacer_ = std::make_unique<PacketPacer>(
         runLoop_, *source_,
@@ -171,6 +180,7 @@ std::optional<Bytes> TelephonyService::handleCommand(const std::string& channelN
       channel.streaming = false;
       channel.queue.clear();
       log::printf(log::kNotice, "Channel %s: streaming stopped", channelName.c_str());
+      updateWantedCodes();
     }
     return std::nullopt;
   }
@@ -191,6 +201,7 @@ void TelephonyService::startStreaming(Channel& channel, const Dictionary& comman
   }
   channel.streaming = true;
   log::printf(log::kNotice, "Channel %s: streaming to %s", channel.name.c_str(), channel.clientPortName.c_str());
+  updateWantedCodes();
   ensureProduction();
 }
 
@@ -199,6 +210,7 @@ void TelephonyService::endChannelSoon(Channel& channel, std::string reason) {
   if (channel.ending) return;
   channel.ending = true;
   channel.streaming = false;
+  updateWantedCodes();
   std::weak_ptr<bool> alive = alive_;
   runLoop_.dispatchAsync([this, alive, name = channel.name, reason = std::move(reason)] {
     if (!alive.expired()) endChannel(name, reason);
@@ -219,6 +231,34 @@ void TelephonyService::endChannel(const std::string& name, const std::string& re
                 static_cast<unsigned long long>(channel->dropped));
   }
   log::printf(log::kNotice, "Log channel %s closed: %s", name.c_str(), reason.c_str());
+  updateWantedCodes();
+}
+
+void TelephonyService::updateWantedCodes() {
+  std::set<std::uint32_t> codes;
+  for (const auto& [name, channel] : channels_) {
+    if (channel->streaming) codes.insert(channel->filter.logCodes().begin(), channel->filter.logCodes().end());
+  }
+  source_->setWantedCodes(codes);
+}
+
+void TelephonyService::produceLive() {
+  produce(std::numeric_limits<std::uint64_t>::max());
+  bool waiting = false;
+  for (auto& [name, channel] : channels_) {
+    flush(*channel);
+    waiting = waiting || (!channel->queue.empty() && !channel->ending);
+  }
+  // A client that is full now gets the rest soon, whether or not more comes.
+  if (waiting && !liveFlushScheduled_) {
+    liveFlushScheduled_ = true;
+    std::weak_ptr<bool> alive = alive_;
+    runLoop_.dispatchAfter(kLiveFlushRetry, [this, alive] {
+      if (alive.expired()) return;
+      liveFlushScheduled_ = false;
+      produceLive();
+    });
+  }
 }
 
 bool TelephonyService::anyoneStreaming() const {
@@ -272,7 +312,7 @@ void TelephonyService::retryProductionSoon() {
 }
 
 void TelephonyService::ensureProduction() {
-  if (sourceEnded_) return;
+  if (sourceEnded_ || source_->isLive()) return;  // a live source's packets are taken as they come
   if (pacer_) {
     pacer_->resume();
     return;

@@ -12,6 +12,7 @@
 #include <cstdint>
 #include <deque>
 #include <map>
+#include <set>
 #include <memory>
 #include <string>
 
@@ -77,6 +78,10 @@ class TelephonyService {
   // channel; fewer when the source has no more for now.
   std::uint64_t produce(std::uint64_t most);
   void retryProductionSoon();
+  // Takes what a live source has, and sends it.
+  void produceLive();
+  // Tells the source which log codes the streaming channels want.
+  void updateWantedCodes();
   void producePaced();
   void pumpAtFullSpeed();
   bool anyoneStreaming() const;
@@ -93,6 +98,7 @@ class TelephonyService {
   // A source that keeps its own time is played by its timestamps, whatever the rate.
   std::unique_ptr<PacketPacer> pacer_;
   bool sourceEnded_ = false;
+  bool liveFlushScheduled_ = false;
   RunLoop::Handle pacedTimer_ = 0;
   RunLoop::Duration pacedStart_{};
   std::uint64_t pacedProduced_ = 0;

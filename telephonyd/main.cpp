@@ -14,6 +14,7 @@
 #include "platform/SocketMessagePort.h"
 #include "platform/SocketTelephonyClient.h"
 #include "platform/Version.h"
+#include "telephonyd/DiagPortSource.h"
 #include "telephonyd/IFXSimulator.h"
 #include "telephonyd/LogCodeSimulator.h"
 #include "telephonyd/ReplaySource.h"
@@ -68,6 +69,10 @@ std::unique_ptr<PacketSource> makeReplay(const ServiceOptions& options, std::str
 
 // What the startup line says of the source.
 std::string sourceText(const ServiceOptions& options, const PacketSource& source) {
+  if (options.diag) {
+    return log::format("bridging the diagnostic port %s (technology %s)", options.diag->c_str(),
+                       options.technology.c_str());
+  }
   if (!options.replay) {
     const std::string pace = options.rate > 0 ? log::format("%g packets/s", options.rate) : "full speed";
     return log::format("technology %s, seed %llu, %s", options.technology.c_str(),
@@ -95,8 +100,12 @@ int main(int argc, char** argv) {
   }
 
   std::string error;
-  auto source = options.replay ? makeReplay(options, error) : makeSimulator(options, error);
-  if (!source) return fail(error);
+  // A diagnostic port is opened once the run loop is there to watch it.
+  std::unique_ptr<PacketSource> source;
+  if (!options.diag) {
+    source = options.replay ? makeReplay(options, error) : makeSimulator(options, error);
+    if (!source) return fail(error);
+  }
   const RuntimeDirectoryResult runtime = prepareRuntimeDirectory();
   if (!runtime) return fail(runtime.error);
 
@@ -122,6 +131,10 @@ int main(int argc, char** argv) {
       error);
   if (!signalEvents) return fail(error);
   ports.interruptWaitsWhenReadable(signalEvents->pendingDescriptor());
+  if (options.diag) {
+    source = DiagPortSource::open(runLoop, *options.diag, options.technology, error);
+    if (!source) return fail(error);
+  }
   const std::string sourceLine = sourceText(options, *source);
   const double rate = options.replay && options.asFastAsPossible ? 0 : options.rate;
   TelephonyService service(ports, runLoop, std::move(source), {rate, options.packetLimit});
