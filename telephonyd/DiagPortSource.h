@@ -72,6 +72,8 @@ class DiagPortSource final : public PacketSource {
   void setWantedCodes(const std::set<std::uint32_t>& logCodes) override;
 
   bool deviceOpen() const { return fd_ >= 0; }
+  // The port has told the number of mask bits of its equipment ids.
+  bool rangesKnown() const { return ranges_.has_value(); }
   const Counts& counts() const { return counts_; }
   // The masks last set, by equipment id (empty while logging is off).
   const std::map<std::uint32_t, std::vector<std::uint8_t>>& masks() const { return sentMasks_; }
