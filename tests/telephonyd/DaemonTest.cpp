@@ -833,5 +833,148 @@ TEST_F(DaemonTest, ReplayOfACaptureThatCannotBeReadOrToldExitsWithStatus1AndOneL
   EXPECT_TRUE(serviceSockets(runtime_.path()).empty());
 }
 
+// --- Bridging a diagnostic port: the fake baseband on a pseudo-terminal ---
+
+const std::string kFakeBaseband = CORVANE_FAKE_BASEBAND_BINARY;
+
+// corvane-fake-baseband in the background, its lines in a file.
+class FakeBaseband {
+ public:
+  FakeBaseband(const std::string& directory, std::vector<std::string> options)
+      : link_(directory + "/diag"), log_(directory + "/baseband.log") {
+    std::vector<std::string> argv{kFakeBaseband, "--link", link_};
+    argv.insert(argv.end(), options.begin(), options.end());
+    pid_ = test::startProcess(argv, {}, log_);
+    waitFor("listening on");
+  }
+  ~FakeBaseband() { test::stopProcess(pid_, SIGTERM); }
+  const std::string& link() const { return link_; }
+  std::string lines() const {
+    std::ifstream in(log_);
+    std::stringstream text;
+    text << in.rdbuf();
+    return text.str();
+  }
+  bool waitFor(const std::string& text, std::chrono::milliseconds limit = 5000ms) const {
+    const auto giveUp = Clock::now() + limit;
+    while (lines().find(text) == std::string::npos) {
+      if (Clock::now() > giveUp) return false;
+      std::this_thread::sleep_for(5ms);
+    }
+    return true;
+  }
+
+ private:
+  std::string link_;
+  std::string log_;
+  int pid_ = -1;
+};
+
+TEST_F(DaemonTest, DiagBridgeSetsTheMaskOfTheStartCommandAndStreamsOnlyItsCodesDecodably) {
+  test::TemporaryDirectory files;
+  FakeBaseband baseband(files.path(), {"--rate", "300", "--seed", "4"});
+  Daemon daemon(ports_, {"--diag", baseband.link(), "--technology", "Quendra_LTE"});
+  {
+    Client client(ports_, loop_);
+    ASSERT_TRUE(client.connected());
+    EXPECT_EQ(client.technology(), "Quendra_LTE");
+    client.keepAll_ = true;
+    ASSERT_EQ(client.start(logCodeStart({0xB0C1, 0xB17F}, {0, 1})), kPortSuccess);
+    ASSERT_TRUE(baseband.waitFor("mask set: id 11: 0xB0C1 0xB17F\n")) << baseband.lines();
+    ASSERT_TRUE(pumpUntil([&] { return client.all_.size() >= 40; }, 5000ms));
+    std::set<std::uint32_t> codes;
+    for (const Bytes& packet : client.all_) codes.insert(effectiveCode(packet));
+    // Only the log codes asked for; the extra codes have no source on a real baseband.
+    EXPECT_EQ(codes, (std::set<std::uint32_t>{0xB0C1, 0xB17F}));
+    auto generator = LogGenerator::generatorFromTechnology("Quendra_LTE");
+    Dictionary state;
+    for (const Bytes& packet : client.all_) generator->updateState(state, packet);
+    const Value display = generator->generateLogUsingState(state);
+    // The serving cell's measurements (0xB17F) are on the screen.
+    const Value* measurements = findKey(display, "Serving Cell Measurements");
+    ASSERT_TRUE(measurements && measurements->asDictionary());
+    const Value* rsrp = measurements->asDictionary()->find("Measured RSRP");
+    ASSERT_TRUE(rsrp && rsrp->asString());
+    EXPECT_NE(rsrp->asString()->find(" dBm"), std::string::npos) << *rsrp->asString();
+  }
+  // The channel gone, the baseband's logging is switched off again.
+  EXPECT_TRUE(baseband.waitFor("logging disabled")) << baseband.lines();
+  EXPECT_TRUE(daemon.running());
+}
+
+TEST_F(DaemonTest, DiagBridgeRecoversWithinSixSecondsWhenThePortVanishes) {
+  test::TemporaryDirectory files;
+  FakeBaseband baseband(files.path(), {"--rate", "200", "--vanish-after", "0.5", "--away-for", "1.5"});
+  Daemon daemon(ports_, {"--diag", baseband.link(), "--technology", "Quendra_LTE"});
+  Client client(ports_, loop_);
+  ASSERT_TRUE(client.connected());
+  client.keepAll_ = true;
+  ASSERT_EQ(client.start(logCodeStart({0xB17F, 0xB179}, {})), kPortSuccess);
+  ASSERT_TRUE(pumpUntil([&] { return !client.all_.empty(); }));
+  ASSERT_TRUE(baseband.waitFor("vanished"));
+  const auto vanished = Clock::now();
+  pumpFor(20ms);
+  const std::size_t before = client.all_.size();
+  // Back after 1.5 s: the service finds it, asks the ranges, sets the mask, and packets flow again.
+  ASSERT_TRUE(pumpUntil([&] { return client.all_.size() > before + 5; }, 6000ms)) << baseband.lines();
+  EXPECT_LT(Clock::now() - vanished, 6s);
+  const std::string lines = baseband.lines();
+  EXPECT_NE(lines.find("back on"), std::string::npos);
+  EXPECT_NE(lines.find("mask set: id 11: 0xB179 0xB17F", lines.find("back on")), std::string::npos) << lines;
+  EXPECT_TRUE(daemon.running());
+}
+
+TEST_F(DaemonTest, DiagBridgeReadsThroughSplitFramesGarbageBadCrcsAndASecondSubscription) {
+  test::TemporaryDirectory files;
+  FakeBaseband baseband(files.path(),
+                        {"--rate", "300", "--split", "--garbage", "--bad-crc", "7", "--subscription"});
+  Daemon daemon(ports_, {"--diag", baseband.link(), "--technology", "Quendra_LTE"});
+  Client client(ports_, loop_);
+  ASSERT_TRUE(client.connected());
+  client.keepAll_ = true;
+  ASSERT_EQ(client.start(logCodeStart({0xB17F, 0xB0C1, 0xB179, 0xB180, 0xB186, 0xB0C2}, {})), kPortSuccess);
+  ASSERT_TRUE(pumpUntil([&] { return client.all_.size() >= 60; }, 5000ms)) << baseband.lines();
+  for (const Bytes& packet : client.all_) {
+    ASSERT_GE(packet.size(), 13u);
+    EXPECT_EQ(packet[0], 0x01);
+    EXPECT_EQ(static_cast<std::size_t>(packet[1] | packet[2] << 8), packet.size() - 1);
+    EXPECT_TRUE(packet[4] == 0xB0 || packet[4] == 0xB1) << static_cast<int>(packet[4]);
+  }
+  EXPECT_TRUE(daemon.running());
+}
+
+TEST_F(DaemonTest, DiagBridgeOfASilentBasebandWaitsWithoutEnding) {
+  test::TemporaryDirectory files;
+  FakeBaseband baseband(files.path(), {"--silent"});
+  Daemon daemon(ports_, {"--diag", baseband.link(), "--technology", "Quendra_LTE"});
+  Client client(ports_, loop_);
+  ASSERT_TRUE(client.connected());
+  ASSERT_EQ(client.start(logCodeStart({0xB17F}, {})), kPortSuccess);
+  // Asked once, then again after each second without an answer.
+  ASSERT_TRUE(baseband.waitFor("ranges asked\nranges asked\n", 4000ms)) << baseband.lines();
+  EXPECT_TRUE(client.all_.empty());
+  EXPECT_TRUE(daemon.running());
+}
+
+TEST_F(DaemonTest, ASecondServiceOnTheSameDiagnosticPortIsRefused) {
+  test::TemporaryDirectory files;
+  FakeBaseband baseband(files.path(), {});
+  Daemon daemon(ports_, {"--diag", baseband.link(), "--technology", "Quendra_LTE"});
+  ASSERT_TRUE(daemon.running());
+  test::TemporaryDirectory otherRuntime;
+  const auto second = test::runProcess({kDaemon, "--diag", baseband.link(), "--technology", "Quendra_LTE"}, "",
+                                       {"CORVANE_RUNTIME_DIR=" + otherRuntime.path() + "/run"});
+  EXPECT_EQ(second.exitCode, 1);
+  EXPECT_EQ(second.err, "corvane-telephonyd: " + baseband.link() +
+                            ": in use: another program holds its lock (is another corvane-telephonyd bridging it?)\n");
+}
+
+TEST_F(DaemonTest, DiagWithoutATechnologyIsRefusedWithTheOptionToGive) {
+  const auto result = test::runProcess({kDaemon, "--diag", "/dev/null"});
+  EXPECT_EQ(result.exitCode, 2);
+  EXPECT_EQ(result.err, "corvane-telephonyd: --diag needs --technology NAME: the baseband does not say which "
+                        "decoder its log codes are for (see --help)\n");
+}
+
 }  // namespace
 }  // namespace corvane
