@@ -42,11 +42,13 @@ constexpr auto kServiceStopLimit = 3s;
 const corvane::ProgramUsage kProgram{
     "corvane-demo",
     "Usage: corvane-demo [--technology NAME] [--seed N] [--device-root DIR]\n"
-    "       corvane-demo --replay FILE [--technology NAME] [--speed X] [--loop] [--device-root DIR]\n",
+    "       corvane-demo --replay FILE [--technology NAME] [--speed X] [--loop] [--device-root DIR]\n"
+    "       corvane-demo --diag DEVICE --technology NAME [--device-root DIR]\n",
     "\n"
-    "Starts the telephony service with its built-in simulator, or playing a\n"
-    "capture, and the Corvane application connected to it. Quitting the\n"
-    "application, Ctrl-C or SIGTERM stop both.\n"
+    "Starts the telephony service with its built-in simulator, playing a\n"
+    "capture, or bridging a baseband's diagnostic port, and the Corvane\n"
+    "application connected to it. Quitting the application, Ctrl-C or SIGTERM\n"
+    "stop both.\n"
     "\n"
     "Options:\n"
     "  -t, --technology NAME  the simulated baseband (default: IFX)\n"
@@ -56,6 +58,7 @@ const corvane::ProgramUsage kProgram{
     "                         told by its log codes unless --technology is given\n"
     "      --speed X          play the capture at X times its pace (default: 1)\n"
     "      --loop             start the capture again after its end\n"
+    "      --diag DEVICE      bridge a baseband's diagnostic port (needs --technology)\n"
     "  -d, --device-root DIR  the phone's file system for the application: it\n"
     "                         holds the marker that offers saving and the\n"
     "                         snapshots (default: $XDG_STATE_HOME/corvane/demo-device,\n"
@@ -166,6 +169,7 @@ int main(int argc, char** argv) {
   std::optional<fs::path> replay;
   std::optional<std::string> speed;
   bool loop = false;
+  std::optional<fs::path> diagPort;
   fs::path root = defaultDeviceRoot();
 
   static constexpr corvane::CommandLineOption kOptions[] = {
@@ -175,6 +179,7 @@ int main(int argc, char** argv) {
       {"replay", 0, true},
       {"speed", 0, true},
       {"loop", 0, false},
+      {"diag", 0, true},
   };
   const corvane::ParsedCommandLine parsed = corvane::parseCommandLine(
       argc, argv, kOptions, [&](std::string_view name, const char* value) -> std::string {
@@ -187,6 +192,7 @@ int main(int argc, char** argv) {
         if (name == "replay") replay = fs::absolute(value);
         if (name == "speed") speed = value;
         if (name == "loop") loop = true;
+        if (name == "diag") diagPort = fs::absolute(value);
         if (name == "seed") {
           char* end = nullptr;
           errno = 0;
@@ -236,7 +242,12 @@ int main(int argc, char** argv) {
 
   std::string spawnError;
   std::vector<std::string> serviceArguments = {serviceProgram.string()};
-  if (replay) {
+  if (diagPort) {
+    // The service says what is missing or wrong (a technology, the device).
+    serviceArguments.insert(serviceArguments.end(), {"--diag", diagPort->string()});
+    if (technologyGiven) serviceArguments.insert(serviceArguments.end(), {"--technology", technology});
+    if (replay) serviceArguments.insert(serviceArguments.end(), {"--replay", replay->string()});
+  } else if (replay) {
     serviceArguments.insert(serviceArguments.end(), {"--replay", replay->string()});
     if (technologyGiven) serviceArguments.insert(serviceArguments.end(), {"--technology", technology});
     if (speed) serviceArguments.insert(serviceArguments.end(), {"--speed", *speed});
@@ -274,7 +285,9 @@ int main(int argc, char** argv) {
     cleanUp(service);
     return fail(spawnError);
   }
-  if (replay) {
+  if (diagPort) {
+    std::printf("corvane-demo: Corvane and the bridge to %s are running; Ctrl-C stops both.\n", diagPort->c_str());
+  } else if (replay) {
     std::printf("corvane-demo: Corvane and a replay of %s are running; Ctrl-C stops both.\n", replay->c_str());
   } else {
     std::printf("corvane-demo: Corvane and the %s simulator (seed %s) are running; Ctrl-C stops both.\n",

@@ -5,18 +5,22 @@
 # to corvane-demo (e.g. --seed 7, or --replay FILE to play a capture instead).
 # Without a display, run it under xvfb-run -a, or use --headless.
 #
-#   bash scripts/run.sh --headless [--replay FILE] [ARGS]
-#                                           the service (simulating IFX, or
-#                                           playing FILE) and corvane-monitor for
-#                                           three display updates, as text
-#                                           (ARGS go to corvane-monitor)
+#   bash scripts/run.sh --headless [SERVICE-OPTIONS] [ARGS]
+#                                           the service (simulating IFX, or as
+#                                           SERVICE-OPTIONS say: --replay FILE,
+#                                           --diag DEVICE, --technology NAME,
+#                                           --speed X, --loop) and
+#                                           corvane-monitor for three display
+#                                           updates, as text (ARGS go to
+#                                           corvane-monitor)
 set -euo pipefail
 # A capture named relative to where this was started, before moving to the repository.
 args=()
 while [ $# -gt 0 ]; do
   case "$1" in
-    --replay) args+=("$1"); shift; [ $# -gt 0 ] && { args+=("$(realpath -m -- "$1")"); shift; } ;;
-    --replay=*) args+=("--replay=$(realpath -m -- "${1#--replay=}")"); shift ;;
+    --replay|--diag) args+=("$1"); shift; [ $# -gt 0 ] && { args+=("$(realpath -m -s -- "$1")"); shift; } ;;
+    --replay=*) args+=("--replay=$(realpath -m -s -- "${1#--replay=}")"); shift ;;
+    --diag=*) args+=("--diag=$(realpath -m -s -- "${1#--diag=}")"); shift ;;
     *) args+=("$1"); shift ;;
   esac
 done
@@ -27,15 +31,20 @@ cmake -S . -B build/release -G Ninja -DCMAKE_BUILD_TYPE=Release -DCORVANE_TESTS=
 
 if [ "${1:-}" = "--headless" ]; then
   shift
-  cmake --build build/release -j "$(nproc)" --target corvane-telephonyd corvane-monitor corvane-decode >/dev/null
+  cmake --build build/release -j "$(nproc)" --target corvane-telephonyd corvane-monitor corvane-decode \
+    corvane-fake-baseband >/dev/null
   # A private runtime directory, so that this run never meets another service.
   export CORVANE_RUNTIME_DIR
   CORVANE_RUNTIME_DIR=$(mktemp -d /tmp/corvane-run-XXXXXX)
-  service_args=(--technology IFX)
-  if [ "${1:-}" = "--replay" ] && [ $# -ge 2 ]; then
-    service_args=(--replay "$2")
-    shift 2
-  fi
+  service_args=()
+  while [ $# -gt 0 ]; do
+    case "$1" in
+      --replay|--diag|--technology|--speed) [ $# -ge 2 ] || break; service_args+=("$1" "$2"); shift 2 ;;
+      --replay=*|--diag=*|--technology=*|--speed=*|--loop) service_args+=("$1"); shift ;;
+      *) break ;;
+    esac
+  done
+  [ ${#service_args[@]} -gt 0 ] || service_args=(--technology IFX)
   build/release/telephonyd/corvane-telephonyd "${service_args[@]}" &
   service=$!
   trap 'kill "$service" 2>/dev/null; wait "$service" 2>/dev/null; rm -rf "$CORVANE_RUNTIME_DIR"' EXIT
@@ -45,5 +54,5 @@ if [ "${1:-}" = "--headless" ]; then
 fi
 
 cmake --build build/release -j "$(nproc)" --target corvane corvane-demo corvane-telephonyd corvane-monitor \
-  corvane-decode >/dev/null
+  corvane-decode corvane-fake-baseband >/dev/null
 exec build/release/app/corvane-demo "$@"
