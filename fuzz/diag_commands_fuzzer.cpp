@@ -9,7 +9,7 @@
 #include <span>
 #include <vector>
 
-#include "telephonyd/DiagCommands.h"
+#include "platform/DiagCommands.h"
 
 using namespace corvane::diag;
 

@@ -32,7 +32,7 @@
 
 #include "platform/DiagFrames.h"
 #include "platform/RunLoop.h"
-#include "telephonyd/DiagCommands.h"
+#include "platform/DiagCommands.h"
 #include "telephonyd/PacketSource.h"
 
 namespace corvane::telephonyd {

@@ -37,7 +37,7 @@
 #include "platform/CommandLine.h"
 #include "platform/DiagFrames.h"
 #include "platform/LogChannelTechnology.h"
-#include "telephonyd/DiagCommands.h"
+#include "platform/DiagCommands.h"
 #include "telephonyd/LogCodeSimulator.h"
 #include "telephonyd/PacketSource.h"
 

@@ -1,4 +1,4 @@
-#include "telephonyd/DiagCommands.h"
+#include "platform/DiagCommands.h"
 
 #include <algorithm>
 
