@@ -41,15 +41,24 @@ constexpr auto kServiceStopLimit = 3s;
 
 const corvane::ProgramUsage kProgram{
     "corvane-demo",
-    "Usage: corvane-demo [--technology NAME] [--seed N] [--device-root DIR]\n",
+    "Usage: corvane-demo [--technology NAME] [--seed N] [--device-root DIR]\n"
+    "       corvane-demo --replay FILE [--technology NAME] [--speed X] [--loop] [--device-root DIR]\n"
+    "       corvane-demo --diag DEVICE --technology NAME [--device-root DIR]\n",
     "\n"
-    "Starts the telephony service with its built-in simulator and the Corvane\n"
+    "Starts the telephony service with its built-in simulator, playing a\n"
+    "capture, or bridging a baseband's diagnostic port, and the Corvane\n"
     "application connected to it. Quitting the application, Ctrl-C or SIGTERM\n"
     "stop both.\n"
     "\n"
     "Options:\n"
     "  -t, --technology NAME  the simulated baseband (default: IFX)\n"
     "  -s, --seed N           the simulator's seed (default: 1)\n"
+    "      --replay FILE      play a capture (DLF, framed stream, hex lines or a\n"
+    "                         snapshot) instead of simulating; its technology is\n"
+    "                         told by its log codes unless --technology is given\n"
+    "      --speed X          play the capture at X times its pace (default: 1)\n"
+    "      --loop             start the capture again after its end\n"
+    "      --diag DEVICE      bridge a baseband's diagnostic port (needs --technology)\n"
     "  -d, --device-root DIR  the phone's file system for the application: it\n"
     "                         holds the marker that offers saving and the\n"
     "                         snapshots (default: $XDG_STATE_HOME/corvane/demo-device,\n"
@@ -156,17 +165,34 @@ void stopService(pid_t service) {
 int main(int argc, char** argv) {
   std::string technology = "IFX";
   std::string seed = "1";
+  bool technologyGiven = false;
+  std::optional<fs::path> replay;
+  std::optional<std::string> speed;
+  bool loop = false;
+  std::optional<fs::path> diagPort;
   fs::path root = defaultDeviceRoot();
 
   static constexpr corvane::CommandLineOption kOptions[] = {
       {"technology", 't', true},
       {"seed", 's', true},
       {"device-root", 'd', true},
+      {"replay", 0, true},
+      {"speed", 0, true},
+      {"loop", 0, false},
+      {"diag", 0, true},
   };
   const corvane::ParsedCommandLine parsed = corvane::parseCommandLine(
       argc, argv, kOptions, [&](std::string_view name, const char* value) -> std::string {
-        if (name == "technology") technology = value;
+        if (name == "technology") {
+          technology = value;
+          technologyGiven = true;
+        }
         if (name == "device-root") root = fs::absolute(value);
+        // The service checks the capture and the speed, and says what is wrong with them.
+        if (name == "replay") replay = fs::absolute(value);
+        if (name == "speed") speed = value;
+        if (name == "loop") loop = true;
+        if (name == "diag") diagPort = fs::absolute(value);
         if (name == "seed") {
           char* end = nullptr;
           errno = 0;
@@ -179,6 +205,9 @@ int main(int argc, char** argv) {
         return {};
       });
   if (const std::optional<int> status = corvane::answerCommandLine(parsed, kProgram)) return *status;
+  if (!replay && (speed || loop)) {
+    return corvane::usageError(kProgram, std::string(speed ? "--speed" : "--loop") + " is for --replay");
+  }
 
   if (!corvane::displayAvailable()) return fail(corvane::noDisplayMessage("corvane-demo"));
 
@@ -212,13 +241,26 @@ int main(int argc, char** argv) {
   };
 
   std::string spawnError;
-  std::vector<std::string> serviceArguments = {serviceProgram.string(), "--technology", technology, "--seed", seed};
-  // The log-code scenarios send several records per simulated second; this
-  // pace plays them at about real time (the service's default suits the IFX
-  // scenario's one report per half second).
-  // The CDMA phone's call adds a traffic frame every 80 ms: about twice as many.
-  if (technology != "IFX") {
-    serviceArguments.insert(serviceArguments.end(), {"--rate", technology == "Quendra_CDMA" ? "20" : "10"});
+  std::vector<std::string> serviceArguments = {serviceProgram.string()};
+  if (diagPort) {
+    // The service says what is missing or wrong (a technology, the device).
+    serviceArguments.insert(serviceArguments.end(), {"--diag", diagPort->string()});
+    if (technologyGiven) serviceArguments.insert(serviceArguments.end(), {"--technology", technology});
+    if (replay) serviceArguments.insert(serviceArguments.end(), {"--replay", replay->string()});
+  } else if (replay) {
+    serviceArguments.insert(serviceArguments.end(), {"--replay", replay->string()});
+    if (technologyGiven) serviceArguments.insert(serviceArguments.end(), {"--technology", technology});
+    if (speed) serviceArguments.insert(serviceArguments.end(), {"--speed", *speed});
+    if (loop) serviceArguments.push_back("--loop");
+  } else {
+    serviceArguments.insert(serviceArguments.end(), {"--technology", technology, "--seed", seed});
+    // The log-code scenarios send several records per simulated second; this
+    // pace plays them at about real time (the service's default suits the IFX
+    // scenario's one report per half second).
+    // The CDMA phone's call adds a traffic frame every 80 ms: about twice as many.
+    if (technology != "IFX") {
+      serviceArguments.insert(serviceArguments.end(), {"--rate", technology == "Quendra_CDMA" ? "20" : "10"});
+    }
   }
   const pid_t service = spawn(serviceArguments, environment, spawnError);
   if (service < 0) {
@@ -246,9 +288,15 @@ int main(int argc, char** argv) {
     cleanUp(service);
     return fail(spawnError);
   }
-  std::printf("corvane-demo: Corvane and the %s simulator (seed %s) are running; Ctrl-C stops both.\n"
-              "corvane-demo: snapshots are saved in %s\n",
-              technology.c_str(), seed.c_str(), snapshots.c_str());
+  if (diagPort) {
+    std::printf("corvane-demo: Corvane and the bridge to %s are running; Ctrl-C stops both.\n", diagPort->c_str());
+  } else if (replay) {
+    std::printf("corvane-demo: Corvane and a replay of %s are running; Ctrl-C stops both.\n", replay->c_str());
+  } else {
+    std::printf("corvane-demo: Corvane and the %s simulator (seed %s) are running; Ctrl-C stops both.\n",
+                technology.c_str(), seed.c_str());
+  }
+  std::printf("corvane-demo: snapshots are saved in %s\n", snapshots.c_str());
   std::fflush(stdout);
 
   bool serviceRunning = true;

@@ -43,7 +43,8 @@ void LogCodeSimulator::addEncoder(std::unique_ptr<Encoder> encoder) { encoders_.
 void LogCodeSimulator::runPeriod() {
   const std::uint64_t period = nextPeriod_++;
   if (period > 0 && period % kPeriodsPerMeasurement == 0) network_.step();
-  const std::uint64_t timestamp = clockStart_ + period * kMicrosecondsPerPeriod;
+  const std::uint64_t timestamp =
+      basebandTimestamp(BasebandMoment(std::chrono::microseconds(clockStart_ + period * kMicrosecondsPerPeriod)));
   due_.clear();
   for (const auto& encoder : encoders_) encoder->encode(network_, period, timestamp, due_);
   for (SourcePacket& packet : due_) pending_.push_back(std::move(packet));

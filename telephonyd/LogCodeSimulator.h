@@ -7,8 +7,9 @@
 // in that order; a period with none adds nothing.
 //
 // Every packet is a log record (telephonyd/LogRecord.h) whose timestamp is the
-// simulated clock at the start of its period: the clock starts at the
-// scenario's start time and advances by the schedule, not by the wall clock.
+// simulated clock at the start of its period, in the baseband's form: the
+// clock starts at the scenario's start time and advances by the schedule, not
+// by the wall clock.
 // So the packets depend only on the technology, the seed and the start time,
 // whatever the pace at which they are taken.
 //
@@ -35,7 +36,8 @@ class LogCodeSimulator final : public PacketSource {
    public:
     virtual ~Encoder() = default;
     // Adds the packets due in `period` (0, 1, 2 ...) to `out`. `timestamp`:
-    // microseconds since 1970-01-01 UTC at the start of the period.
+    // the record timestamp of the start of the period (baseband form,
+    // LogRecord.h; basebandMoment() tells the moment).
     virtual void encode(const SimulatedNetwork& network, std::uint64_t period, std::uint64_t timestamp,
                         std::vector<SourcePacket>& out) = 0;
   };

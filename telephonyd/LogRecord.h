@@ -7,12 +7,14 @@
 //                offset 1 (this field, code, timestamp and payload), so 12 +
 //                the payload's size
 //   offset 3-4   log code, little-endian (an extra code's n, not 0xFF0000 + n)
-//   offset 5-12  timestamp, little-endian: microseconds since 1970-01-01 UTC
-//                on the packet source's clock
+//   offset 5-12  timestamp, little-endian, the baseband's own form: the
+//                upper 48 bits count 1.25 ms ticks since 1980-01-06 00:00:00
+//                UTC, the lower 16 bits a fraction of a tick
 //   offset 13-   payload
 //
 // Extra codes carry a binary property list as their payload.
 
+#include <chrono>
 #include <cstddef>
 #include <cstdint>
 #include <span>
@@ -27,6 +29,16 @@ inline constexpr std::size_t kLogRecordHeaderSize = 12;
 inline constexpr std::size_t kLogPacketHeaderSize = 1 + kLogRecordHeaderSize;
 // The record length is 16 bits wide.
 inline constexpr std::size_t kMaximumLogPayloadSize = 0xFFFF - kLogRecordHeaderSize;
+
+// The record timestamp of a moment: the ticks and the fraction of a tick
+// (rounded down to 1/65536). Moments before the baseband epoch give 0.
+using BasebandMoment = std::chrono::sys_time<std::chrono::microseconds>;
+std::uint64_t basebandTimestamp(BasebandMoment moment);
+// The moment a record timestamp names, to the microsecond (rounded down).
+BasebandMoment basebandMoment(std::uint64_t timestamp);
+// The time from one timestamp to a later one, to the microsecond; negative
+// when `to` is the earlier.
+std::chrono::microseconds basebandInterval(std::uint64_t from, std::uint64_t to);
 
 // Throw std::length_error for a payload beyond kMaximumLogPayloadSize: no
 // record can say how long it is.

@@ -14,6 +14,7 @@
 #include "LogGenerator/lte/records/ReselectionCandidatesRecord.h"
 #include "LogGenerator/lte/records/ServingCellIdentityRecord.h"
 #include "LogGenerator/lte/records/ServingCellMeasurementRecord.h"
+#include "telephonyd/LogRecord.h"
 #include "telephonyd/RecordWriter.h"
 
 namespace corvane::telephonyd {
@@ -131,7 +132,11 @@ std::vector<int> neighbourChannels(const SimulatedNetwork& network) {
 
 // What the 0xB179 subframe counter shows: the millisecond within the
 // 10240 ms cycle of system frames.
-std::uint32_t subframeNumberAt(std::uint64_t timestamp) { return static_cast<std::uint32_t>(timestamp / 1000 % 10240); }
+std::uint32_t subframeNumberAt(std::uint64_t timestamp) {
+  const auto milliseconds =
+      std::chrono::duration_cast<std::chrono::milliseconds>(basebandMoment(timestamp).time_since_epoch()).count();
+  return static_cast<std::uint32_t>(milliseconds % 10240);
+}
 
 constexpr std::uint64_t periodsIn(std::chrono::milliseconds span) {
   return static_cast<std::uint64_t>(span / LogCodeSimulator::kPeriod);

@@ -1,10 +1,11 @@
 #pragma once
 
-// Where the service's packets come from. Today that is the built-in simulator;
-// replayed capture files and a live baseband diagnostic port are meant to sit
-// behind the same interface.
+// Where the service's packets come from: the built-in simulator, a replayed
+// capture file, or a live baseband's diagnostic port.
 
+#include <chrono>
 #include <cstdint>
+#include <functional>
 #include <memory>
 #include <optional>
 #include <set>
@@ -24,6 +25,9 @@ struct SourcePacket {
   // The log code (or extra code) of a log-code packet; none for technologies
   // whose packets are not log records (IFX).
   std::optional<std::uint32_t> code;
+  // Sources that keep their own time (PacketSource::keepsTime): when the
+  // packet is due, counted from the source's first packet.
+  std::chrono::nanoseconds due{0};
 };
 
 class PacketSource {
@@ -31,7 +35,30 @@ class PacketSource {
   virtual ~PacketSource() = default;
   // The LogChannelTechnology value that "GetTechnology" answers.
   virtual std::string_view technology() const = 0;
+
+  enum class Availability {
+    Ready,  // nextPacket() has one now
+    Later,  // none yet (a capture's reader is behind): ask again soon
+    Ended,  // none ever again (a capture played to its end)
+  };
+  // The simulators are always ready.
+  virtual Availability availability() { return Availability::Ready; }
+  // Only while available() is Ready.
   virtual SourcePacket nextPacket() = 0;
+
+  // True when the packets say when they are due (SourcePacket::due), as a
+  // replayed capture's timestamps do; otherwise the service paces them at its
+  // rate.
+  virtual bool keepsTime() const { return false; }
+
+  // A live source (a baseband's diagnostic port) has packets when they come:
+  // it calls the handler on the run loop whenever new ones are ready, and the
+  // service takes them at once. Other sources never call it.
+  virtual bool isLive() const { return false; }
+  virtual void setArrivalHandler(std::function<void()> /*arrived*/) {}
+  // The log codes that the streaming channels ask for, all together, each time
+  // that changes; a live source asks its baseband for just those.
+  virtual void setWantedCodes(const std::set<std::uint32_t>& /*logCodes*/) {}
 };
 
 // The packets one channel asked for in its start command: packets without a

@@ -19,6 +19,18 @@ struct ServiceOptions {
   // when the scenario starts; none for the time the service starts.
   std::optional<std::uint64_t> clockStart;
   bool logToStandardError = false;
+  // Whether --technology was given (else the default, or a replayed capture's own).
+  bool technologyGiven = false;
+
+  // A capture to play instead of the simulator.
+  std::optional<std::string> replay;
+  // Of the capture's own pace; ignored at full speed.
+  double speed = 1.0;
+  bool asFastAsPossible = false;
+  bool loop = false;
+
+  // A baseband's diagnostic port to bridge instead of simulating.
+  std::optional<std::string> diag;
 };
 
 struct ParsedOptions {

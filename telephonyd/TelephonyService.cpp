@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <chrono>
 #include <cmath>
+#include <limits>
 #include <utility>
 
 #include "platform/Log.h"
@@ -31,6 +32,8 @@ constexpr std::size_t kFullSpeedBatch = 1024;
 constexpr auto kFullSpeedSlice = 5ms;
 // Most packets made in one paced tick after the loop was held up.
 constexpr std::uint64_t kMaximumCatchUp = 10000;
+// A live source's packets that a client could not take yet are offered again after this.
+constexpr auto kLiveFlushRetry = 5ms;
 // Messages handed to one batched send.
 constexpr std::size_t kMessagesPerFlush = 2048;
 
@@ -46,7 +49,25 @@ Bytes serviceReply(std::int32_t domain, std::int32_t code, const std::string& re
 
 TelephonyService::TelephonyService(SocketPortSystem& ports, RunLoop& runLoop, std::unique_ptr<PacketSource> source,
                                    Settings settings)
-    : ports_(ports), runLoop_(runLoop), source_(std::move(source)), settings_(settings) {}
+    : ports_(ports), runLoop_(runLoop), source_(std::move(source)), settings_(settings) {
+  if (source_->isLive()) {
+    std::weak_ptr<bool> alive = alive_;
+    source_->setArrivalHandler([this, alive] {
+      if (!alive.expired()) produceLive();
+    });
+  }
+  if (source_->keepsTime()) {
+    pacer_ = std::make_unique<PacketPacer>(
+        runLoop_, *source_,
+        [this](const SourcePacket& packet) {
+          for (auto& [name, channel] : channels_) offer(*channel, packet);
+        },
+        [this] {
+          for (auto& [name, channel] : channels_) flush(*channel);
+          if (!anyoneStreaming()) pacer_->pause();
+        });
+  }
+}
 
 TelephonyService::~TelephonyService() {
   stop();
@@ -74,6 +95,7 @@ void TelephonyService::stop() {
   for (const auto& name : names) endChannel(name, "the service is stopping");
   if (pacedTimer_) runLoop_.cancel(pacedTimer_);
   pacedTimer_ = 0;
+  if (pacer_) pacer_->pause();
   if (servicePort_) {
     servicePort_->invalidate();
     servicePort_.reset();
@@ -158,6 +180,7 @@ std::optional<Bytes> TelephonyService::handleCommand(const std::string& channelN
       channel.streaming = false;
       channel.queue.clear();
       log::printf(log::kNotice, "Channel %s: streaming stopped", channelName.c_str());
+      updateWantedCodes();
     }
     return std::nullopt;
   }
@@ -178,6 +201,7 @@ void TelephonyService::startStreaming(Channel& channel, const Dictionary& comman
   }
   channel.streaming = true;
   log::printf(log::kNotice, "Channel %s: streaming to %s", channel.name.c_str(), channel.clientPortName.c_str());
+  updateWantedCodes();
   ensureProduction();
 }
 
@@ -186,6 +210,7 @@ void TelephonyService::endChannelSoon(Channel& channel, std::string reason) {
   if (channel.ending) return;
   channel.ending = true;
   channel.streaming = false;
+  updateWantedCodes();
   std::weak_ptr<bool> alive = alive_;
   runLoop_.dispatchAsync([this, alive, name = channel.name, reason = std::move(reason)] {
     if (!alive.expired()) endChannel(name, reason);
@@ -206,6 +231,34 @@ void TelephonyService::endChannel(const std::string& name, const std::string& re
                 static_cast<unsigned long long>(channel->dropped));
   }
   log::printf(log::kNotice, "Log channel %s closed: %s", name.c_str(), reason.c_str());
+  updateWantedCodes();
+}
+
+void TelephonyService::updateWantedCodes() {
+  std::set<std::uint32_t> codes;
+  for (const auto& [name, channel] : channels_) {
+    if (channel->streaming) codes.insert(channel->filter.logCodes().begin(), channel->filter.logCodes().end());
+  }
+  source_->setWantedCodes(codes);
+}
+
+void TelephonyService::produceLive() {
+  produce(std::numeric_limits<std::uint64_t>::max());
+  bool waiting = false;
+  for (auto& [name, channel] : channels_) {
+    flush(*channel);
+    waiting = waiting || (!channel->queue.empty() && !channel->ending);
+  }
+  // A client that is full now gets the rest soon, whether or not more comes.
+  if (waiting && !liveFlushScheduled_) {
+    liveFlushScheduled_ = true;
+    std::weak_ptr<bool> alive = alive_;
+    runLoop_.dispatchAfter(kLiveFlushRetry, [this, alive] {
+      if (alive.expired()) return;
+      liveFlushScheduled_ = false;
+      produceLive();
+    });
+  }
 }
 
 bool TelephonyService::anyoneStreaming() const {
@@ -249,7 +302,21 @@ bool TelephonyService::flush(Channel& channel) {
   return progress;
 }
 
+void TelephonyService::retryProductionSoon() {
+  if (pumpScheduled_) return;
+  pumpScheduled_ = true;
+  std::weak_ptr<bool> alive = alive_;
+  runLoop_.dispatchAfter(PacketPacer::kRetry, [this, alive] {
+    if (!alive.expired()) pumpAtFullSpeed();
+  });
+}
+
 void TelephonyService::ensureProduction() {
+  if (sourceEnded_ || source_->isLive()) return;  // a live source's packets are taken as they come
+  if (pacer_) {
+    pacer_->resume();
+    return;
+  }
   if (settings_.rate > 0) {
     if (pacedTimer_) return;
     pacedStart_ = runLoop_.now();
@@ -285,12 +352,27 @@ void TelephonyService::producePaced() {
     pacedProduced_ = due - kMaximumCatchUp;
     count = kMaximumCatchUp;
   }
-  for (std::uint64_t i = 0; i < count; ++i) {
+  // A source that has nothing yet makes up for it at the next tick.
+  pacedProduced_ += produce(count);
+  for (auto& [name, channel] : channels_) flush(*channel);
+  if (sourceEnded_) {
+    runLoop_.cancel(pacedTimer_);
+    pacedTimer_ = 0;
+  }
+}
+
+std::uint64_t TelephonyService::produce(std::uint64_t most) {
+  std::uint64_t made = 0;
+  for (; made < most; ++made) {
+    const PacketSource::Availability availability = source_->availability();
+    if (availability != PacketSource::Availability::Ready) {
+      sourceEnded_ = availability == PacketSource::Availability::Ended;
+      break;
+    }
     const SourcePacket packet = source_->nextPacket();
-    ++pacedProduced_;
     for (auto& [name, channel] : channels_) offer(*channel, packet);
   }
-  for (auto& [name, channel] : channels_) flush(*channel);
+  return made;
 }
 
 void TelephonyService::pumpAtFullSpeed() {
@@ -314,12 +396,15 @@ void TelephonyService::pumpAtFullSpeed() {
       if (!channel->queue.empty()) blocked.push_back({channel->delivery->descriptor(), POLLOUT, 0});
     }
     if (!anyWanting && blocked.empty()) return;  // nothing left to send: stop until a new start
-    if (anyWanting && shortestQueue < kFullSpeedBatch) {
-      for (std::size_t i = 0; i < kFullSpeedBatch; ++i) {
-        const SourcePacket packet = source_->nextPacket();
-        for (auto& [name, channel] : channels_) offer(*channel, packet);
+    if (anyWanting && shortestQueue < kFullSpeedBatch && !sourceEnded_) {
+      if (produce(kFullSpeedBatch) > 0) continue;
+      if (blocked.empty()) {
+        // The source has nothing yet (or has ended, and stays so).
+        if (!sourceEnded_) retryProductionSoon();
+        return;
       }
-      continue;
+    } else if (blocked.empty()) {
+      return;  // the source has ended and everything has gone
     }
     const auto now = std::chrono::steady_clock::now();
     if (!progress && !blocked.empty()) {

@@ -12,11 +12,13 @@
 #include <cstdint>
 #include <deque>
 #include <map>
+#include <set>
 #include <memory>
 #include <string>
 
 #include "platform/RunLoop.h"
 #include "platform/SocketMessagePort.h"
+#include "telephonyd/PacketPacer.h"
 #include "telephonyd/PacketSource.h"
 
 namespace corvane::telephonyd {
@@ -24,7 +26,9 @@ namespace corvane::telephonyd {
 class TelephonyService {
  public:
   struct Settings {
-    double rate = 2.0;               // packets per second; 0 as fast as the clients read
+    // Packets per second; 0 as fast as the clients read. A source that keeps
+    // its own time (a replayed capture) is paced by it instead.
+    double rate = 2.0;
     std::uint64_t packetLimit = 0;   // per channel; 0 for no limit
   };
 
@@ -70,6 +74,14 @@ class TelephonyService {
   // Sends what the channel's socket takes now; true when something went.
   bool flush(Channel& channel);
   void ensureProduction();
+  // Takes up to `most` packets from the source, offering each to every
+  // channel; fewer when the source has no more for now.
+  std::uint64_t produce(std::uint64_t most);
+  void retryProductionSoon();
+  // Takes what a live source has, and sends it.
+  void produceLive();
+  // Tells the source which log codes the streaming channels want.
+  void updateWantedCodes();
   void producePaced();
   void pumpAtFullSpeed();
   bool anyoneStreaming() const;
@@ -83,6 +95,10 @@ class TelephonyService {
   // Work queued on the run loop checks this, so that none of it runs after the service is gone.
   std::shared_ptr<bool> alive_ = std::make_shared<bool>(true);
 
+  // A source that keeps its own time is played by its timestamps, whatever the rate.
+  std::unique_ptr<PacketPacer> pacer_;
+  bool sourceEnded_ = false;
+  bool liveFlushScheduled_ = false;
   RunLoop::Handle pacedTimer_ = 0;
   RunLoop::Duration pacedStart_{};
   std::uint64_t pacedProduced_ = 0;

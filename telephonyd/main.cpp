@@ -14,8 +14,10 @@
 #include "platform/SocketMessagePort.h"
 #include "platform/SocketTelephonyClient.h"
 #include "platform/Version.h"
+#include "telephonyd/DiagPortSource.h"
 #include "telephonyd/IFXSimulator.h"
 #include "telephonyd/LogCodeSimulator.h"
+#include "telephonyd/ReplaySource.h"
 #include "telephonyd/ServiceOptions.h"
 #include "telephonyd/TelephonyService.h"
 
@@ -50,6 +52,38 @@ std::unique_ptr<PacketSource> makeSimulator(const ServiceOptions& options, std::
   return nullptr;
 }
 
+std::unique_ptr<PacketSource> makeReplay(const ServiceOptions& options, std::string& error) {
+  ReplaySource::Settings settings;
+  settings.path = *options.replay;
+  if (options.technologyGiven) settings.technology = options.technology;
+  settings.speed = options.asFastAsPossible ? 0 : options.speed;
+  settings.loop = options.loop;
+  if (options.rate > 0) {
+    settings.untimedInterval =
+        std::chrono::duration_cast<std::chrono::nanoseconds>(std::chrono::duration<double>(1.0 / options.rate));
+  } else {
+    settings.untimedInterval = std::chrono::nanoseconds::zero();
+  }
+  return ReplaySource::open(std::move(settings), error);
+}
+
+// What the startup line says of the source.
+std::string sourceText(const ServiceOptions& options, const PacketSource& source) {
+  if (options.diag) {
+    return log::format("bridging the diagnostic port %s (technology %s)", options.diag->c_str(),
+                       options.technology.c_str());
+  }
+  if (!options.replay) {
+    const std::string pace = options.rate > 0 ? log::format("%g packets/s", options.rate) : "full speed";
+    return log::format("technology %s, seed %llu, %s", options.technology.c_str(),
+                       static_cast<unsigned long long>(options.seed), pace.c_str());
+  }
+  const std::string pace = options.asFastAsPossible ? "as fast as possible" : log::format("speed %g", options.speed);
+  return log::format("replaying %s (technology %.*s, %s%s)", options.replay->c_str(),
+                     static_cast<int>(source.technology().size()), source.technology().data(), pace.c_str(),
+                     options.loop ? ", in a loop" : "");
+}
+
 }  // namespace
 
 int main(int argc, char** argv) {
@@ -66,8 +100,12 @@ int main(int argc, char** argv) {
   }
 
   std::string error;
-  auto source = makeSimulator(options, error);
-  if (!source) return fail(error);
+  // A diagnostic port is opened once the run loop is there to watch it.
+  std::unique_ptr<PacketSource> source;
+  if (!options.diag) {
+    source = options.replay ? makeReplay(options, error) : makeSimulator(options, error);
+    if (!source) return fail(error);
+  }
   const RuntimeDirectoryResult runtime = prepareRuntimeDirectory();
   if (!runtime) return fail(runtime.error);
 
@@ -93,7 +131,13 @@ int main(int argc, char** argv) {
       error);
   if (!signalEvents) return fail(error);
   ports.interruptWaitsWhenReadable(signalEvents->pendingDescriptor());
-  TelephonyService service(ports, runLoop, std::move(source), {options.rate, options.packetLimit});
+  if (options.diag) {
+    source = DiagPortSource::open(runLoop, *options.diag, options.technology, error);
+    if (!source) return fail(error);
+  }
+  const std::string sourceLine = sourceText(options, *source);
+  const double rate = options.replay && options.asFastAsPossible ? 0 : options.rate;
+  TelephonyService service(ports, runLoop, std::move(source), {rate, options.packetLimit});
   if (!service.start(error)) {
     const std::string path = ports.socketPath(std::string(kTelephonyServicePortName)).string();
     if (ports.createSocketRemotePort(std::string(kTelephonyServicePortName))) {
@@ -102,10 +146,8 @@ int main(int argc, char** argv) {
     return fail(error);
   }
 
-  const std::string pace = options.rate > 0 ? log::format("%g packets/s", options.rate) : "full speed";
-  log::printf(log::kNotice, "corvane-telephonyd %s serving %s: technology %s, seed %llu, %s", kVersion,
-              ports.socketPath(std::string(kTelephonyServicePortName)).c_str(), options.technology.c_str(),
-              static_cast<unsigned long long>(options.seed), pace.c_str());
+  log::printf(log::kNotice, "corvane-telephonyd %s serving %s: %s", kVersion,
+              ports.socketPath(std::string(kTelephonyServicePortName)).c_str(), sourceLine.c_str());
   const int status = QCoreApplication::exec();
   service.stop();
   // Repeats of the last line, counted but not yet written.

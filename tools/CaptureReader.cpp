@@ -9,6 +9,7 @@
 #include <cstdio>
 #include <cstring>
 
+#include "platform/DiagCommands.h"
 #include "platform/PropertyList.h"
 
 namespace corvane::tools {
@@ -28,8 +29,6 @@ constexpr std::size_t kRecordHeaderSize = 12;
 constexpr std::uint16_t kVersionReportCode = 0x1FFD;
 constexpr std::uint8_t kTypeOrdinary = 0x01;
 constexpr std::uint8_t kTypeExtraCode = 0xFF;
-constexpr std::uint8_t kLogCommand = 0x10;
-constexpr std::size_t kLogFrameHeader = 4;
 constexpr std::uint64_t kTimestampSpread = std::uint64_t{1} << 52;
 constexpr std::string_view kBinaryPropertyListMagic = "bplist00";
 
@@ -203,19 +202,18 @@ bool readFramed(Window& window, const CaptureOptions& options, const PacketFunct
   diag::Deframer deframer(options.keepBadCrc);
   auto onFrame = [&](const diag::Deframer::Frame& frame) {
     std::span<std::uint8_t> f = frame.bytes;
-    if (f[0] != kLogCommand) {
+    if (f[0] != diag::kLogCommand) {
       ++counts.otherCommands[f[0]];
       return;
     }
-    if (f.size() < kLogFrameHeader + kRecordHeaderSize || le16(f.data() + 2) != f.size() - kLogFrameHeader ||
-        le16(f.data() + kLogFrameHeader) != f.size() - kLogFrameHeader) {
+    if (!diag::logRecordOfFrame(f)) {
       ++counts.malformedLogFrames;
       return;
     }
     // The type byte takes the place of the length's high byte, just before the record.
-    const auto record = f.subspan(kLogFrameHeader);
-    f[kLogFrameHeader - 1] = typeOfRecord(record);
-    const std::span<const std::uint8_t> p = f.subspan(kLogFrameHeader - 1);
+    constexpr std::size_t kHeader = diag::kLogFrameHeaderSize;
+    f[kHeader - 1] = typeOfRecord(f.subspan(kHeader));
+    const std::span<const std::uint8_t> p = f.subspan(kHeader - 1);
     if (p[0] == kTypeOrdinary && le16(p.data() + 3) == kVersionReportCode) return;
     countPacket(counts, p);
     packet(p);

@@ -7,6 +7,7 @@
 #include <signal.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <chrono>
 #include <filesystem>
 #include <fstream>
@@ -75,9 +76,10 @@ class DemoLauncher : public ::testing::Test {
   }
 
   // Starts the demo and waits for the application and the service to run.
-  void start() {
-    demo_ = test::startProcess({kDemo, "--seed", "5", "--device-root", dir_.path() + "/device"}, environment(),
-                               output());
+  void start(std::vector<std::string> options = {"--seed", "5"}) {
+    std::vector<std::string> argv{kDemo, "--device-root", dir_.path() + "/device"};
+    argv.insert(argv.end(), options.begin(), options.end());
+    demo_ = test::startProcess(argv, environment(), output());
     ASSERT_TRUE(waitUntil([&] { return childrenOf(demo_).size() == 2; })) << readFile(output());
     for (const auto& [pid, name] : childrenOf(demo_)) {
       if (name == "corvane") app_ = pid;
@@ -131,6 +133,21 @@ TEST_F(DemoLauncher, RejectsArgumentsItDoesNotKnow) {
       << result.err;
   EXPECT_EQ(test::runProcess({kDemo, "--seed", "many"}).exitCode, 2);
   EXPECT_EQ(test::runProcess({kDemo, "extra"}).exitCode, 2);
+  const test::ProcessResult speed = test::runProcess({kDemo, "--speed", "2"});
+  EXPECT_EQ(speed.exitCode, 2);
+  EXPECT_EQ(speed.err.rfind("corvane-demo: --speed is for --replay\n", 0), 0u) << speed.err;
+}
+
+TEST_F(DemoLauncher, AReplayHandsTheCaptureToTheServiceByItsWholePath) {
+  ASSERT_NO_FATAL_FAILURE(start({"--replay", CORVANE_SOURCE_DIR "/tools/samples/lte-session.hex", "--loop"}));
+  std::string commandLine = readFile("/proc/" + std::to_string(service_) + "/cmdline");
+  std::replace(commandLine.begin(), commandLine.end(), '\0', ' ');
+  EXPECT_NE(commandLine.find(" --replay " CORVANE_SOURCE_DIR "/tools/samples/lte-session.hex --loop"),
+            std::string::npos)
+      << commandLine;
+  EXPECT_EQ(commandLine.find("--seed"), std::string::npos) << commandLine;
+  EXPECT_NE(readFile(output()).find("a replay of " CORVANE_SOURCE_DIR "/tools/samples/lte-session.hex"),
+            std::string::npos);
 }
 
 TEST_F(DemoLauncher, HelpAndVersionNeedNoDisplayAndStartNothing) {

@@ -29,6 +29,7 @@
 #include "platform/Version.h"
 #include "platform/VirtualRunLoop.h"
 #include "support/LogRecords.h"
+#include "telephonyd/LogRecord.h"
 #include "support/Process.h"
 #include "transport/RawPeer.h"
 #include "transport/RuntimeTestDirectory.h"
@@ -337,8 +338,9 @@ TEST_F(DaemonTest, LogCodePacketsTravelToTheDecodeToolsReadersAndDecoderUnchange
   EXPECT_EQ(effectiveCode(packets[0]), 0xFF0000u);
   EXPECT_EQ(effectiveCode(packets[1]), 0xFF0001u);
   EXPECT_EQ(effectiveCode(packets[2]), 0xFF0002u);
+  // 1800000000 s since 1970 is 1484035200 s, 1 187 228 160 000 ticks of 1.25 ms, since 1980-01-06.
   EXPECT_EQ(Bytes(packets[0].begin() + 5, packets[0].begin() + 13),
-            (Bytes{0x00, 0x80, 0x98, 0x28, 0x17, 0x65, 0x06, 0x00}));  // 1 800 000 000 000 000 us
+            (Bytes{0x00, 0x00, 0x00, 0x10, 0x50, 0x6C, 0x14, 0x01}));
 
   tools::InputError error;
   // As hex text, one packet per line.
@@ -714,6 +716,258 @@ TEST_F(DaemonTest, RuntimeDirectoryThatIsASymbolicLinkIsRefusedAsSuch) {
                             " is a symbolic link, which is not followed; remove the link so that the directory is "
                             "made afresh, or set CORVANE_RUNTIME_DIR to a private directory\n");
   EXPECT_TRUE(serviceSockets(runtime_.path()).empty());
+}
+
+// --- Replaying a capture ---
+
+// A DLF of `count` records, `ticks` apart (1.25 ms each): LTE serving-cell
+// measurements (0xB17F) and identities (0xB0C1) in turn, and every fifth a
+// cell list (extra code 1). Each record's payload holds its number.
+std::string replayCapture(int count, std::uint64_t ticks, std::vector<Bytes>& packets) {
+  std::string dlf;
+  for (int i = 0; i < count; ++i) {
+    const std::uint64_t timestamp = (1'000'000 + static_cast<std::uint64_t>(i) * ticks) << 16;
+    Bytes packet;
+    if (i % 5 == 4) {
+      Array cells;
+      cells.append(Value::integer(i));
+      packet = telephonyd::encodeExtraCodePacket(1, timestamp, Value(cells));
+    } else {
+      const Bytes payload{static_cast<std::uint8_t>(i), static_cast<std::uint8_t>(i >> 8)};
+      packet = telephonyd::encodeLogPacket(i % 2 == 0 ? 0xB17F : 0xB0C1, timestamp, payload);
+    }
+    dlf.append(packet.begin() + 1, packet.end());
+    packets.push_back(std::move(packet));
+  }
+  return dlf;
+}
+
+TEST_F(DaemonTest, ReplayStreamsOnlyTheCapturesPacketsThatTheStartCommandAsksForInTheirOrder) {
+  test::TemporaryDirectory files;
+  std::vector<Bytes> packets;
+  const std::string capture = files.write("lte.dlf", replayCapture(3000, 1, packets));
+  Daemon daemon(ports_, {"--replay", capture, "--as-fast-as-possible"});
+  Client client(ports_, loop_);
+  ASSERT_TRUE(client.connected());
+  // The technology is the capture's: its log codes are LTE's.
+  EXPECT_EQ(client.technology(), "Quendra_LTE");
+  client.keepAll_ = true;
+  ASSERT_EQ(client.start(logCodeStart({0xB17F}, {1})), kPortSuccess);
+  std::vector<Bytes> expected;
+  for (std::size_t i = 0; i < packets.size(); ++i) {
+    if (i % 5 == 4 || i % 2 == 0) expected.push_back(packets[i]);
+  }
+  ASSERT_TRUE(pumpUntil([&] { return client.all_.size() >= expected.size(); }, 10000ms)) << client.all_.size();
+  pumpFor(100ms);
+  EXPECT_EQ(client.all_, expected);
+  EXPECT_TRUE(std::all_of(client.ids_.begin(), client.ids_.end(), [](MessageId id) { return id == 0; }));
+  // Played once: the service stays, with its channel open and answering.
+  EXPECT_TRUE(daemon.running());
+  EXPECT_EQ(client.technology(), "Quendra_LTE");
+}
+
+TEST_F(DaemonTest, ReplayFollowsTheRecordsTimestampsAndItsSpeed) {
+  test::TemporaryDirectory files;
+  std::vector<Bytes> packets;
+  // Six records 200 ms apart (160 ticks): the last is due 1 s after the first.
+  const std::string capture = files.write("paced.dlf", replayCapture(6, 160, packets));
+  for (const char* speed : {"1", "4"}) {
+    Daemon daemon(ports_, {"--replay", capture, "--speed", speed});
+    Client client(ports_, loop_);
+    ASSERT_TRUE(client.connected());
+    client.keepAll_ = true;
+    ASSERT_EQ(client.start(logCodeStart({0xB17F, 0xB0C1}, {1})), kPortSuccess);
+    ASSERT_TRUE(pumpUntil([&] { return !client.all_.empty(); }));
+    const auto first = Clock::now();
+    ASSERT_TRUE(pumpUntil([&] { return client.all_.size() == 6; }, 5000ms));
+    const auto took = Clock::now() - first;
+    EXPECT_EQ(client.all_, packets);
+    if (std::string(speed) == "1") {
+      EXPECT_GE(took, 950ms);
+      EXPECT_LT(took, 2500ms);
+    } else {
+      EXPECT_GE(took, 230ms);
+      EXPECT_LT(took, 900ms);
+    }
+  }
+}
+
+TEST_F(DaemonTest, ReplayInALoopStartsTheCaptureAgain) {
+  test::TemporaryDirectory files;
+  std::vector<Bytes> packets;
+  const std::string capture = files.write("loop.dlf", replayCapture(10, 1, packets));
+  Daemon daemon(ports_, {"--replay", capture, "--loop", "--as-fast-as-possible", "--packets", "35"});
+  Client client(ports_, loop_);
+  ASSERT_TRUE(client.connected());
+  client.keepAll_ = true;
+  ASSERT_EQ(client.start(logCodeStart({0xB17F, 0xB0C1}, {1})), kPortSuccess);
+  ASSERT_TRUE(pumpUntil([&] { return client.all_.size() >= 35; }));
+  for (std::size_t i = 0; i < 35; ++i) EXPECT_EQ(client.all_[i], packets[i % 10]) << i;
+}
+
+TEST_F(DaemonTest, ReplayOfACaptureThatCannotBeReadOrToldExitsWithStatus1AndOneLine) {
+  test::TemporaryDirectory files;
+  const auto missing = test::runProcess({kDaemon, "--replay", files.path() + "/missing.dlf"});
+  EXPECT_EQ(missing.exitCode, 1);
+  EXPECT_EQ(missing.err,
+            "corvane-telephonyd: " + files.path() + "/missing.dlf: cannot open: No such file or directory\n");
+  // Only the service's own extra codes: no technology to tell.
+  std::vector<Bytes> packets;
+  std::string extraOnly;
+  for (int i = 0; i < 3; ++i) {
+    const Bytes packet = telephonyd::encodeExtraCodePacket(1, static_cast<std::uint64_t>(i) << 16, Value(Array{}));
+    extraOnly.append(packet.begin() + 1, packet.end());
+  }
+  const std::string capture = files.write("extra.dlf", extraOnly);
+  const auto untold = test::runProcess({kDaemon, "--replay", capture});
+  EXPECT_EQ(untold.exitCode, 1);
+  EXPECT_EQ(untold.err, "corvane-telephonyd: cannot tell the technology of " + capture +
+                            ": it holds no log records, only the service's own extra codes; give it with "
+                            "--technology NAME\n");
+  EXPECT_TRUE(serviceSockets(runtime_.path()).empty());
+}
+
+// --- Bridging a diagnostic port: the fake baseband on a pseudo-terminal ---
+
+const std::string kFakeBaseband = CORVANE_FAKE_BASEBAND_BINARY;
+
+// corvane-fake-baseband in the background, its lines in a file.
+class FakeBaseband {
+ public:
+  FakeBaseband(const std::string& directory, std::vector<std::string> options)
+      : link_(directory + "/diag"), log_(directory + "/baseband.log") {
+    std::vector<std::string> argv{kFakeBaseband, "--link", link_};
+    argv.insert(argv.end(), options.begin(), options.end());
+    pid_ = test::startProcess(argv, {}, log_);
+    waitFor("listening on");
+  }
+  ~FakeBaseband() { test::stopProcess(pid_, SIGTERM); }
+  const std::string& link() const { return link_; }
+  std::string lines() const {
+    std::ifstream in(log_);
+    std::stringstream text;
+    text << in.rdbuf();
+    return text.str();
+  }
+  bool waitFor(const std::string& text, std::chrono::milliseconds limit = 5000ms) const {
+    const auto giveUp = Clock::now() + limit;
+    while (lines().find(text) == std::string::npos) {
+      if (Clock::now() > giveUp) return false;
+      std::this_thread::sleep_for(5ms);
+    }
+    return true;
+  }
+
+ private:
+  std::string link_;
+  std::string log_;
+  int pid_ = -1;
+};
+
+TEST_F(DaemonTest, DiagBridgeSetsTheMaskOfTheStartCommandAndStreamsOnlyItsCodesDecodably) {
+  test::TemporaryDirectory files;
+  FakeBaseband baseband(files.path(), {"--rate", "300", "--seed", "4"});
+  Daemon daemon(ports_, {"--diag", baseband.link(), "--technology", "Quendra_LTE"});
+  {
+    Client client(ports_, loop_);
+    ASSERT_TRUE(client.connected());
+    EXPECT_EQ(client.technology(), "Quendra_LTE");
+    client.keepAll_ = true;
+    ASSERT_EQ(client.start(logCodeStart({0xB0C1, 0xB17F}, {0, 1})), kPortSuccess);
+    ASSERT_TRUE(baseband.waitFor("mask set: id 11: 0xB0C1 0xB17F\n")) << baseband.lines();
+    ASSERT_TRUE(pumpUntil([&] { return client.all_.size() >= 40; }, 5000ms));
+    std::set<std::uint32_t> codes;
+    for (const Bytes& packet : client.all_) codes.insert(effectiveCode(packet));
+    // Only the log codes asked for; the extra codes have no source on a real baseband.
+    EXPECT_EQ(codes, (std::set<std::uint32_t>{0xB0C1, 0xB17F}));
+    auto generator = LogGenerator::generatorFromTechnology("Quendra_LTE");
+    Dictionary state;
+    for (const Bytes& packet : client.all_) generator->updateState(state, packet);
+    const Value display = generator->generateLogUsingState(state);
+    // The serving cell's measurements (0xB17F) are on the screen.
+    const Value* measurements = findKey(display, "Serving Cell Measurements");
+    ASSERT_TRUE(measurements && measurements->asDictionary());
+    const Value* rsrp = measurements->asDictionary()->find("Measured RSRP");
+    ASSERT_TRUE(rsrp && rsrp->asString());
+    EXPECT_NE(rsrp->asString()->find(" dBm"), std::string::npos) << *rsrp->asString();
+  }
+  // The channel gone, the baseband's logging is switched off again.
+  EXPECT_TRUE(baseband.waitFor("logging disabled")) << baseband.lines();
+  EXPECT_TRUE(daemon.running());
+}
+
+TEST_F(DaemonTest, DiagBridgeRecoversWithinSixSecondsWhenThePortVanishes) {
+  test::TemporaryDirectory files;
+  FakeBaseband baseband(files.path(), {"--rate", "200", "--vanish-after", "0.5", "--away-for", "1.5"});
+  Daemon daemon(ports_, {"--diag", baseband.link(), "--technology", "Quendra_LTE"});
+  Client client(ports_, loop_);
+  ASSERT_TRUE(client.connected());
+  client.keepAll_ = true;
+  ASSERT_EQ(client.start(logCodeStart({0xB17F, 0xB179}, {})), kPortSuccess);
+  ASSERT_TRUE(pumpUntil([&] { return !client.all_.empty(); }));
+  ASSERT_TRUE(baseband.waitFor("vanished"));
+  const auto vanished = Clock::now();
+  pumpFor(20ms);
+  const std::size_t before = client.all_.size();
+  // Back after 1.5 s: the service finds it, asks the ranges, sets the mask, and packets flow again.
+  ASSERT_TRUE(pumpUntil([&] { return client.all_.size() > before + 5; }, 6000ms)) << baseband.lines();
+  EXPECT_LT(Clock::now() - vanished, 6s);
+  const std::string lines = baseband.lines();
+  EXPECT_NE(lines.find("back on"), std::string::npos);
+  EXPECT_NE(lines.find("mask set: id 11: 0xB179 0xB17F", lines.find("back on")), std::string::npos) << lines;
+  EXPECT_TRUE(daemon.running());
+}
+
+TEST_F(DaemonTest, DiagBridgeReadsThroughSplitFramesGarbageBadCrcsAndASecondSubscription) {
+  test::TemporaryDirectory files;
+  FakeBaseband baseband(files.path(),
+                        {"--rate", "300", "--split", "--garbage", "--bad-crc", "7", "--subscription"});
+  Daemon daemon(ports_, {"--diag", baseband.link(), "--technology", "Quendra_LTE"});
+  Client client(ports_, loop_);
+  ASSERT_TRUE(client.connected());
+  client.keepAll_ = true;
+  ASSERT_EQ(client.start(logCodeStart({0xB17F, 0xB0C1, 0xB179, 0xB180, 0xB186, 0xB0C2}, {})), kPortSuccess);
+  ASSERT_TRUE(pumpUntil([&] { return client.all_.size() >= 60; }, 5000ms)) << baseband.lines();
+  for (const Bytes& packet : client.all_) {
+    ASSERT_GE(packet.size(), 13u);
+    EXPECT_EQ(packet[0], 0x01);
+    EXPECT_EQ(static_cast<std::size_t>(packet[1] | packet[2] << 8), packet.size() - 1);
+    EXPECT_TRUE(packet[4] == 0xB0 || packet[4] == 0xB1) << static_cast<int>(packet[4]);
+  }
+  EXPECT_TRUE(daemon.running());
+}
+
+TEST_F(DaemonTest, DiagBridgeOfASilentBasebandWaitsWithoutEnding) {
+  test::TemporaryDirectory files;
+  FakeBaseband baseband(files.path(), {"--silent"});
+  Daemon daemon(ports_, {"--diag", baseband.link(), "--technology", "Quendra_LTE"});
+  Client client(ports_, loop_);
+  ASSERT_TRUE(client.connected());
+  ASSERT_EQ(client.start(logCodeStart({0xB17F}, {})), kPortSuccess);
+  // Asked once, then again after each second without an answer.
+  ASSERT_TRUE(baseband.waitFor("ranges asked\nranges asked\n", 4000ms)) << baseband.lines();
+  EXPECT_TRUE(client.all_.empty());
+  EXPECT_TRUE(daemon.running());
+}
+
+TEST_F(DaemonTest, ASecondServiceOnTheSameDiagnosticPortIsRefused) {
+  test::TemporaryDirectory files;
+  FakeBaseband baseband(files.path(), {});
+  Daemon daemon(ports_, {"--diag", baseband.link(), "--technology", "Quendra_LTE"});
+  ASSERT_TRUE(daemon.running());
+  test::TemporaryDirectory otherRuntime;
+  const auto second = test::runProcess({kDaemon, "--diag", baseband.link(), "--technology", "Quendra_LTE"}, "",
+                                       {"CORVANE_RUNTIME_DIR=" + otherRuntime.path() + "/run"});
+  EXPECT_EQ(second.exitCode, 1);
+  EXPECT_EQ(second.err, "corvane-telephonyd: " + baseband.link() +
+                            ": in use: another program holds its lock (is another corvane-telephonyd bridging it?)\n");
+}
+
+TEST_F(DaemonTest, DiagWithoutATechnologyIsRefusedWithTheOptionToGive) {
+  const auto result = test::runProcess({kDaemon, "--diag", "/dev/null"});
+  EXPECT_EQ(result.exitCode, 2);
+  EXPECT_EQ(result.err, "corvane-telephonyd: --diag needs --technology NAME: the baseband does not say which "
+                        "decoder its log codes are for (see --help)\n");
 }
 
 }  // namespace

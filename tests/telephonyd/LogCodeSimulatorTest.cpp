@@ -32,6 +32,12 @@ Record recordOf(const Bytes& packet) {
   return r;
 }
 
+// Microseconds from the scenario's start to a record's timestamp.
+std::uint64_t sinceStart(const Record& record) {
+  return static_cast<std::uint64_t>(
+      (basebandMoment(record.timestamp) - BasebandMoment(std::chrono::microseconds(kStart))).count());
+}
+
 std::vector<SourcePacket> firstPackets(std::string_view technology, std::uint64_t seed, std::size_t count) {
   auto scenario = makeLogCodeScenario(technology, seed, kStart);
   std::vector<SourcePacket> packets;
@@ -56,7 +62,9 @@ TEST(LogCodeSimulatorTest, PeriodZeroReportsSimFilesCellListAndPdpContextsAtTheC
   for (const auto& [n, value] : expected) {
     const SourcePacket packet = scenario->nextPacket();
     EXPECT_EQ(packet.code, kExtraCodeBase + n);
-    EXPECT_EQ(*packet.data, encodeExtraCodePacket(static_cast<std::uint16_t>(n), kStart, value));
+    EXPECT_EQ(*packet.data, encodeExtraCodePacket(static_cast<std::uint16_t>(n),
+                                                  basebandTimestamp(BasebandMoment(std::chrono::microseconds(kStart))),
+                                                  value));
   }
 }
 
@@ -76,7 +84,7 @@ TEST(LogCodeSimulatorTest, EveryPacketIsAWellFramedExtraCodeRecordWithItsCode) {
   }
 }
 
-TEST(LogCodeSimulatorTest, TimestampsFollowTheScheduleInMicroseconds) {
+TEST(LogCodeSimulatorTest, TimestampsAreTheBasebandsAndFollowTheSchedule) {
   std::vector<std::uint64_t> cellLists, simFiles, pdpContexts;
   std::vector<Record> records;
   for (const SourcePacket& packet : firstPackets(kLogChannelTechnologyQuendraUTRAN2, 1, 200)) {
@@ -88,7 +96,9 @@ TEST(LogCodeSimulatorTest, TimestampsFollowTheScheduleInMicroseconds) {
   // The packets of whole periods: the last period may have more to come.
   for (const Record& record : records) {
     if (record.timestamp == records.back().timestamp) break;
-    const std::uint64_t at = record.timestamp - kStart;
+    // Whole 1.25 ms ticks: every period starts on one.
+    EXPECT_EQ(record.timestamp & 0xFFFF, 0u);
+    const std::uint64_t at = sinceStart(record);
     (record.code == 0 ? simFiles : record.code == 1 ? cellLists : pdpContexts).push_back(at);
   }
   ASSERT_GE(cellLists.size(), 100u);
@@ -115,7 +125,7 @@ TEST(LogCodeSimulatorTest, PdpContextsAreReportedAsSoonAsTheyChange) {
     if (record.code == 2) {
       EXPECT_EQ(plist::parseOrThrow(record.payload), scenario->network().pdpContexts()) << "packet " << i;
       reported = generation;
-      outOfTurn += (record.timestamp - kStart) % 5'000'000 != 0 ? 1 : 0;
+      outOfTurn += sinceStart(record) % 5'000'000 != 0 ? 1 : 0;
     }
     if (record.code == 1) {
       // A change is reported in the period of the measurement step that made it.
@@ -165,7 +175,7 @@ TEST(LogCodeSimulatorTest, FurtherEncodersJoinTheScheduleInPeriodOrder) {
   for (int i = 0; i < 6; ++i) {
     const SourcePacket packet = scenario.nextPacket();
     codes.push_back(*packet.code);
-    times.push_back(recordOf(*packet.data).timestamp - kStart);
+    times.push_back(sinceStart(recordOf(*packet.data)));
   }
   EXPECT_EQ(codes, (std::vector<std::uint32_t>{0xFF0000, 0xFF0001, 0xFF0002, 0xB0C2, 0xB0C2, 0xB0C2}));
   EXPECT_EQ(times, (std::vector<std::uint64_t>{0, 0, 0, 0, 80'000, 160'000}));

@@ -16,6 +16,7 @@
 
 #include "platform/Value.h"
 #include "telephonyd/LogCodeSimulator.h"
+#include "telephonyd/LogRecord.h"
 
 namespace corvane::telephonyd::scenario {
 
@@ -57,7 +58,8 @@ class PeriodReader {
   static std::uint64_t periodOf(const SourcePacket& packet) {
     std::uint64_t timestamp = 0;
     for (int i = 7; i >= 0; --i) timestamp = timestamp << 8 | packet.data->at(static_cast<std::size_t>(5 + i));
-    return (timestamp - kScenarioStart) / kMicrosecondsPerPeriod;
+    const auto since = basebandMoment(timestamp) - BasebandMoment(std::chrono::microseconds(kScenarioStart));
+    return static_cast<std::uint64_t>(since.count()) / kMicrosecondsPerPeriod;
   }
 
   std::unique_ptr<LogCodeSimulator> scenario_;

@@ -66,6 +66,44 @@ TEST(ServiceOptionsTest, BadInputExitsWithStatus2AndOneLine) {
             "(see --help)");
 }
 
+TEST(ServiceOptionsTest, ReplayOptionsAreRead) {
+  const ParsedOptions plain = parse({"--replay", "capture.dlf"});
+  EXPECT_FALSE(plain.exit) << plain.error;
+  EXPECT_EQ(plain.options.replay, "capture.dlf");
+  EXPECT_FALSE(plain.options.technologyGiven);
+  EXPECT_EQ(plain.options.speed, 1.0);
+  EXPECT_FALSE(plain.options.asFastAsPossible);
+  EXPECT_FALSE(plain.options.loop);
+
+  const ParsedOptions all = parse({"--replay=c.hex", "-t", "Quendra_GSM", "--speed", "2.5", "--loop"});
+  EXPECT_FALSE(all.exit) << all.error;
+  EXPECT_EQ(all.options.replay, "c.hex");
+  EXPECT_TRUE(all.options.technologyGiven);
+  EXPECT_EQ(all.options.technology, "Quendra_GSM");
+  EXPECT_EQ(all.options.speed, 2.5);
+  EXPECT_TRUE(all.options.loop);
+  EXPECT_TRUE(parse({"--replay", "c", "--as-fast-as-possible"}).options.asFastAsPossible);
+}
+
+TEST(ServiceOptionsTest, ReplayOptionsThatDoNotFitAreRefusedWithAReason) {
+  EXPECT_EQ(parse({"--speed", "2"}).error, "--speed is for --replay (see --help)");
+  EXPECT_EQ(parse({"--loop"}).error, "--loop is for --replay (see --help)");
+  EXPECT_EQ(parse({"--as-fast-as-possible"}).error, "--as-fast-as-possible is for --replay (see --help)");
+  EXPECT_EQ(parse({"--replay", "c", "--speed", "2", "--as-fast-as-possible"}).error,
+            "give --speed or --as-fast-as-possible, not both (see --help)");
+  EXPECT_EQ(parse({"--replay", "c", "--seed", "3"}).error,
+            "--seed is for the simulator, not for --replay (see --help)");
+  EXPECT_EQ(parse({"--replay", "c", "--clock-start", "1800000000"}).error,
+            "--clock-start is for the simulator, not for --replay (see --help)");
+  for (const char* speed : {"0", "-1", "fast", "max"}) {
+    const ParsedOptions parsed = parse({"--replay", "c", "--speed", speed});
+    EXPECT_EQ(parsed.exitCode, 2) << speed;
+    EXPECT_EQ(parsed.error, "invalid speed '" + std::string(speed) +
+                                "': give a factor above 0, such as 0.5 or 10 (see --help)");
+  }
+  EXPECT_EQ(parse({"--replay", ""}).error, "--replay needs a file (see --help)");
+}
+
 TEST(ServiceOptionsTest, HelpAndVersionPrintAndExitWithStatus0) {
   const ParsedOptions help = parse({"--help"});
   EXPECT_TRUE(help.exit);
@@ -73,6 +111,8 @@ TEST(ServiceOptionsTest, HelpAndVersionPrintAndExitWithStatus0) {
   EXPECT_EQ(help.output.rfind("Usage: corvane-telephonyd", 0), 0u);
   EXPECT_NE(help.output.find("--technology"), std::string::npos);
   EXPECT_NE(help.output.find("--clock-start"), std::string::npos);
+  EXPECT_NE(help.output.find("--replay FILE"), std::string::npos);
+  EXPECT_NE(help.output.find("--as-fast-as-possible"), std::string::npos);
   EXPECT_EQ(help.output, serviceUsage());
   const ParsedOptions version = parse({"--version"});
   EXPECT_TRUE(version.exit);
