@@ -80,11 +80,15 @@ class DemoLauncher : public ::testing::Test {
     std::vector<std::string> argv{kDemo, "--device-root", dir_.path() + "/device"};
     argv.insert(argv.end(), options.begin(), options.end());
     demo_ = test::startProcess(argv, environment(), output());
-    ASSERT_TRUE(waitUntil([&] { return childrenOf(demo_).size() == 2; })) << readFile(output());
-    for (const auto& [pid, name] : childrenOf(demo_)) {
-      if (name == "corvane") app_ = pid;
-      if (name.rfind("corvane-teleph", 0) == 0) service_ = pid;  // the kernel keeps 15 characters
-    }
+    // Both children, once each has become its program (between fork and exec a child still has the demo's name).
+    ASSERT_TRUE(waitUntil([&] {
+      app_ = service_ = -1;
+      for (const auto& [pid, name] : childrenOf(demo_)) {
+        if (name == "corvane") app_ = pid;
+        if (name.rfind("corvane-teleph", 0) == 0) service_ = pid;  // the kernel keeps 15 characters
+      }
+      return app_ > 0 && service_ > 0;
+    })) << readFile(output());
     ASSERT_GT(app_, 0);
     ASSERT_GT(service_, 0);
     ASSERT_TRUE(waitUntil([&] { return readFile(output()).find("snapshots are saved in") != std::string::npos; }));
