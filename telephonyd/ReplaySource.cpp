@@ -6,6 +6,7 @@
 
 #include "CaptureReader.h"
 #include "LogGenerator/LogCodeTechnologies.h"
+#include "LogGenerator/cdma2000/C2KDecoders.h"
 #include "platform/Log.h"
 #include "platform/LogChannelTechnology.h"
 #include "telephonyd/LogRecord.h"
@@ -83,20 +84,27 @@ std::string technologyOfCodes(const std::map<std::uint32_t, std::uint64_t>& code
   std::uint64_t logPackets = 0;
   for (const auto& [code, count] : codes) logPackets += code < kExtraCodeBase ? count : 0;
   if (logPackets == 0 && reports > 0) return std::string(kLogChannelTechnologyIFX);
+  // The codes each technology's decoders read: the section tables', and the CDMA2000 decoders'.
+  std::vector<std::pair<std::string_view, std::set<std::uint32_t>>> readers;
+  for (const LogCodeTechnology& technology : logCodeTechnologies()) {
+    std::set<std::uint32_t>& read = readers.emplace_back(technology.technology, std::set<std::uint32_t>{}).second;
+    for (const SectionDescriptor& row : technology.sections()) read.insert(row.codes.begin(), row.codes.end());
+  }
+  std::set<std::uint32_t>& cdma = readers.emplace_back(kLogChannelTechnologyQuendraCDMA, std::set<std::uint32_t>{}).second;
+  for (const c2k::CodeDecoder& decoder : c2k::kDecoders) cdma.insert(decoder.code);
+
   std::string best;
   std::string tiedWith;
   std::uint64_t most = 0;
-  for (const LogCodeTechnology& technology : logCodeTechnologies()) {
-    std::set<std::uint32_t> read;
-    for (const SectionDescriptor& row : technology.sections()) read.insert(row.codes.begin(), row.codes.end());
+  for (const auto& [technology, read] : readers) {
     std::uint64_t votes = 0;
     for (const auto& [code, count] : codes) votes += code < kExtraCodeBase && read.count(code) ? count : 0;
     if (votes > most) {
       most = votes;
-      best = technology.technology;
+      best = technology;
       tiedWith.clear();
     } else if (votes == most && votes > 0) {
-      tiedWith = technology.technology;
+      tiedWith = technology;
     }
   }
   if (most == 0) {

@@ -212,6 +212,8 @@ TEST(TechnologyOfCodesTest, ExtraCodesDoNotCountAndReportsAloneAreIfx) {
   EXPECT_EQ(technologyOfCodes({}, 3, why), "IFX");
   EXPECT_EQ(technologyOfCodes({{0xFF0001, 100}, {kLteCode, 1}}, 0, why), "Quendra_LTE");
   EXPECT_EQ(technologyOfCodes({{kLteCode, 2}, {kGsmCode, 3}}, 0, why), "Quendra_GSM");
+  // The CDMA2000 decoders' codes (1x status, EV-DO status) are CDMA's.
+  EXPECT_EQ(technologyOfCodes({{0x119C, 2}, {0x1183, 2}, {kLteCode, 3}}, 0, why), "Quendra_CDMA");
 }
 
 TEST_F(ReplaySourceTest, AMissingOrUnreadableFileIsAnErrorNamingIt) {
