@@ -6,6 +6,7 @@
 #include "telephonyd/GsmUmtsRadioEncoder.h"
 #include "telephonyd/LogRecord.h"
 #include "telephonyd/LteRadioEncoder.h"
+#include "telephonyd/UtranRadioEncoder.h"
 
 namespace corvane::telephonyd {
 
@@ -80,6 +81,7 @@ std::unique_ptr<LogCodeSimulator> makeLogCodeScenario(std::string_view technolog
   scenario->addEncoder(std::make_unique<ExtraCodeEncoder>());
   if (technology == kLogChannelTechnologyQuendraLTE) scenario->addEncoder(std::make_unique<LteRadioEncoder>());
   if (technology == kLogChannelTechnologyQuendraGSM) scenario->addEncoder(std::make_unique<GsmUmtsRadioEncoder>());
+  if (technology == kLogChannelTechnologyQuendraUTRAN2) scenario->addEncoder(std::make_unique<UtranRadioEncoder>());
   return scenario;
 }
 
