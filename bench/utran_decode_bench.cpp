@@ -25,31 +25,21 @@
 #include <vector>
 
 #include "DecodeBenchSinks.h"
+#include "ScenarioPackets.h"
 #include "LogGenerator/utran/UTRANLogGenerator.h"
 #include "platform/Log.h"
 #include "platform/LogChannelTechnology.h"
-#include "telephonyd/LogCodeSimulator.h"
 
 namespace {
 
 using namespace corvane;
 
 constexpr std::uint64_t kSeed = 5;
-constexpr std::uint64_t kStart = 1'800'000'000'000'000;  // microseconds
 constexpr std::uint64_t kSessionMicroseconds = 40'000'000;
 
 // The scenario's packets of the session; with or without the extra codes.
 std::vector<Bytes> session(bool extraCodes) {
-  auto scenario = telephonyd::makeLogCodeScenario(kLogChannelTechnologyQuendraUTRAN2, kSeed, kStart);
-  std::vector<Bytes> packets;
-  for (;;) {
-    const telephonyd::SourcePacket packet = scenario->nextPacket();
-    std::uint64_t timestamp = 0;
-    for (int i = 7; i >= 0; --i) timestamp = timestamp << 8 | packet.data->at(static_cast<std::size_t>(5 + i));
-    if (timestamp - kStart >= kSessionMicroseconds) break;
-    if (extraCodes || *packet.code < telephonyd::kExtraCodeBase) packets.push_back(*packet.data);
-  }
-  return packets;
+  return bench::scenarioPackets(kLogChannelTechnologyQuendraUTRAN2, kSeed, kSessionMicroseconds, extraCodes);
 }
 
 // The UTRAN generator as its factory makes it (it searches for its template),
@@ -91,11 +81,7 @@ BENCHMARK(BM_UtranDecodeMixWithExtraCodes);
 
 // Each radio code of the session alone.
 void BM_UtranDecodeByCode(benchmark::State& state, std::uint32_t code) {
-  std::vector<Bytes> packets;
-  for (Bytes& packet : session(false)) {
-    if (static_cast<std::uint32_t>(packet[3] | packet[4] << 8) == code) packets.push_back(std::move(packet));
-  }
-  runPackets(state, packets, SinkKind::ErrorsOnly);
+  runPackets(state, bench::packetsOfCode(session(false), code), SinkKind::ErrorsOnly);
 }
 BENCHMARK_CAPTURE(BM_UtranDecodeByCode, 0xD00A, 0xD00Au);
 BENCHMARK_CAPTURE(BM_UtranDecodeByCode, 0xD00C, 0xD00Cu);

@@ -133,10 +133,6 @@ std::vector<int> neighbourChannels(const SimulatedNetwork& network) {
 // 10240 ms cycle of system frames.
 std::uint32_t subframeNumberAt(std::uint64_t timestamp) { return static_cast<std::uint32_t>(timestamp / 1000 % 10240); }
 
-constexpr std::uint64_t periodsIn(std::chrono::milliseconds span) {
-  return static_cast<std::uint64_t>(span / LogCodeSimulator::kPeriod);
-}
-
 }  // namespace
 
 // --- Schedule ---
@@ -168,7 +164,7 @@ void LteRadioEncoder::encode(const SimulatedNetwork& network, std::uint64_t peri
   const bool cellChanged = network.cellChanges() != reportedCellChanges_;
   reportedCellChanges_ = network.cellChanges();
   for (const Report& report : reports()) {
-    if (!cellChanged && period % periodsIn(report.every) != 0) continue;
+    if (!cellChanged && period % LogCodeSimulator::periodsIn(report.every) != 0) continue;
     if (auto packet = (this->*report.build)(network, timestamp)) {
       out.push_back({std::make_shared<const Bytes>(std::move(*packet)), report.code});
     }

@@ -47,15 +47,6 @@ constexpr std::array<Cctrch, 1> kFachCctrchs = {{{1, 6}}};
 // The RRC states are the state numbers of the record.
 std::uint32_t stateNumber(UtranRrcJourney::State state) { return static_cast<std::uint32_t>(state); }
 
-std::uint32_t unsignedOf(int value) {
-  if (value < 0) throw std::logic_error(std::to_string(value) + " is written as an unsigned field");
-  return static_cast<std::uint32_t>(value);
-}
-
-constexpr std::uint64_t periodsIn(std::chrono::milliseconds span) {
-  return static_cast<std::uint64_t>(span / LogCodeSimulator::kPeriod);
-}
-
 // The cells of an access technology other than the serving one, measured ones
 // first, each part strongest first.
 std::vector<const Cell*> neighboursOf(const SimulatedNetwork& network, Access access) {
@@ -107,7 +98,7 @@ void UtranRadioEncoder::encode(const SimulatedNetwork& network, std::uint64_t pe
   reportedCellChanges_ = network.cellChanges();
   reportedStateChanges_ = rrc.changes();
   for (const Report& report : reports()) {
-    if (!changed && period % periodsIn(report.every) != 0) continue;
+    if (!changed && period % LogCodeSimulator::periodsIn(report.every) != 0) continue;
     if (auto packet = (this->*report.build)(network, timestamp)) {
       out.push_back({std::make_shared<const Bytes>(std::move(*packet)), report.code});
     }

@@ -43,18 +43,9 @@ bool has(const Period& period, std::uint32_t code) {
 }
 
 // The UTRAN decoder, fed packet by packet.
-class UtranDecoder {
+class UtranDecoder : public scenario::Decoder {
  public:
-  UtranDecoder() : generator_(LogGenerator::generatorFromTechnology(kLogChannelTechnologyQuendraUTRAN2)) {}
-  void feed(const Period& period) {
-    for (const SourcePacket& packet : period.packets) generator_->updateState(state_, *packet.data);
-  }
-  Value display() { return generator_->generateLogUsingState(state_); }
-
- private:
-  log::ScopedCapture quiet_;
-  std::unique_ptr<LogGenerator> generator_;
-  Dictionary state_;
+  UtranDecoder() : Decoder(kLogChannelTechnologyQuendraUTRAN2) {}
 };
 
 std::vector<Dictionary> listRows(const Value& display, std::string_view section) {
