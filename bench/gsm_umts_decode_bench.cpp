@@ -26,30 +26,20 @@
 
 #include "LogGenerator/gsm_umts/QND_GSMLogGenerator.h"
 #include "DecodeBenchSinks.h"
+#include "ScenarioPackets.h"
 #include "platform/Log.h"
 #include "platform/LogChannelTechnology.h"
-#include "telephonyd/LogCodeSimulator.h"
 
 namespace {
 
 using namespace corvane;
 
 constexpr std::uint64_t kSeed = 2;
-constexpr std::uint64_t kStart = 1'800'000'000'000'000;  // microseconds
 constexpr std::uint64_t kJourneyMicroseconds = 45'000'000;
 
 // The scenario's packets of one journey; with or without the extra codes.
 std::vector<Bytes> journey(bool extraCodes) {
-  auto scenario = telephonyd::makeLogCodeScenario(kLogChannelTechnologyQuendraGSM, kSeed, kStart);
-  std::vector<Bytes> packets;
-  for (;;) {
-    const telephonyd::SourcePacket packet = scenario->nextPacket();
-    std::uint64_t timestamp = 0;
-    for (int i = 7; i >= 0; --i) timestamp = timestamp << 8 | packet.data->at(static_cast<std::size_t>(5 + i));
-    if (timestamp - kStart >= kJourneyMicroseconds) break;
-    if (extraCodes || *packet.code < telephonyd::kExtraCodeBase) packets.push_back(*packet.data);
-  }
-  return packets;
+  return bench::scenarioPackets(kLogChannelTechnologyQuendraGSM, kSeed, kJourneyMicroseconds, extraCodes);
 }
 
 using bench::makeSink;
@@ -74,11 +64,7 @@ BENCHMARK(BM_GsmUmtsDecodeMixWithExtraCodes);
 
 // Each radio code of the journey alone.
 void BM_GsmUmtsDecodeByCode(benchmark::State& state, std::uint32_t code) {
-  std::vector<Bytes> packets;
-  for (Bytes& packet : journey(false)) {
-    if (static_cast<std::uint32_t>(packet[3] | packet[4] << 8) == code) packets.push_back(std::move(packet));
-  }
-  runPackets(state, packets, SinkKind::ErrorsOnly);
+  runPackets(state, bench::packetsOfCode(journey(false), code), SinkKind::ErrorsOnly);
 }
 BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x4005, 0x4005u);
 BENCHMARK_CAPTURE(BM_GsmUmtsDecodeByCode, 0x4031, 0x4031u);

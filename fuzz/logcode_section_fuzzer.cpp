@@ -9,8 +9,9 @@
 // Besides the sanitizers' checks: no exception leaves the section but the
 // SIM files' UnknownDataException (a bounded accessor asked out of range
 // would throw), every row a section makes is a string or a list of strings or
-// of string rows, a list read from packet bytes holds no more rows than the
-// packet has bytes for, and the array lock is free again.
+// of string rows (in a list's row: a string or a list of strings), a list
+// read from packet bytes holds no more rows than the packet has bytes for,
+// and the array lock is free again.
 
 #include <cstdint>
 #include <cstdlib>
@@ -66,6 +67,19 @@ bool onlyStringRows(const Dictionary& rows) {
   return true;
 }
 
+// A list's row holds strings, or a list of strings ("SIR").
+bool stringOrStringListRows(const Dictionary& rows) {
+  for (const auto& entry : rows.entries()) {
+    if (entry.second.isString()) continue;
+    const Array* list = entry.second.asArray();
+    if (!list) return false;
+    for (const Value& element : list->elements()) {
+      if (!element.isString()) return false;
+    }
+  }
+  return true;
+}
+
 // A row of a dictionary section is a string, or a list of its own: of
 // strings ("ARFCNs") or of row dictionaries of strings ("Transport Channels").
 bool wellFormedRows(const Dictionary& rows) {
@@ -95,7 +109,7 @@ void check(const Value& container, std::size_t packetSize, bool fromPacketBytes,
   if (fromPacketBytes && !list.empty() && packetSize < kLogRecordHeaderSize + list.size()) std::abort();
   for (const Value& row : list.elements()) {
     const Dictionary* d = row.asDictionary();
-    if (!d || !onlyStringRows(*d)) std::abort();
+    if (!d || !stringOrStringListRows(*d)) std::abort();
   }
 }
 

@@ -101,6 +101,7 @@ void SyslogSink::write(int priority, std::string_view text) {
 }
 
 bool SyslogSink::wants(int priority) const {
+  if (priority == kMessage) return false;
   // setlogmask(0) reads the mask without changing it.
   return (setlogmask(0) & LOG_MASK(LOG_PRI(priority))) != 0 && daemonPresent();
 }
@@ -143,10 +144,20 @@ void RepeatCollapsingSink::flushLocked() {
 }
 
 std::shared_ptr<Sink> makeSystemLogSink() {
-  return std::make_shared<RepeatCollapsingSink>(std::make_shared<SyslogSink>());
+  return std::make_shared<TeeSink>(std::vector<std::shared_ptr<Sink>>{
+      std::make_shared<RepeatCollapsingSink>(std::make_shared<SyslogSink>()), std::make_shared<MessageLogSink>()});
+}
+
+void MessageLogSink::write(int priority, std::string_view text) {
+  if (priority != kMessage) return;
+  std::fprintf(stderr, "%.*s\n", static_cast<int>(text.size()), text.data());
 }
 
 void StderrSink::write(int priority, std::string_view text) {
+  if (priority == kMessage) {
+    std::fprintf(stderr, "%.*s\n", static_cast<int>(text.size()), text.data());
+    return;
+  }
   std::fprintf(stderr, "<%d> %.*s\n", priority, static_cast<int>(text.size()), text.data());
 }
 

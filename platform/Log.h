@@ -20,6 +20,11 @@ namespace corvane::log {
 inline constexpr int kError = 3;
 inline constexpr int kWarning = 4;
 inline constexpr int kNotice = 5;
+// The general message log: lines without a syslog priority, which go to
+// standard error and never to the system log. They travel through the same
+// sinks as the system log's lines under this pseudo-priority, so tests capture
+// them alike and a line nobody records is never formatted.
+inline constexpr int kMessage = -1;
 
 class Sink {
  public:
@@ -106,13 +111,22 @@ class RepeatCollapsingSink final : public Sink {
   std::uint64_t repeats_ = 0;
 };
 
-// The system log as production code uses it: repeats collapsed, then syslog(3).
+// The system log as production code uses it: repeats collapsed, then
+// syslog(3); the general message log's lines to standard error.
 std::shared_ptr<Sink> makeSystemLogSink();
 
-// Writes "<priority> <text>" lines to standard error.
+// Writes "<priority> <text>" lines to standard error, and the general message
+// log's lines as their text alone.
 class StderrSink final : public Sink {
  public:
   void write(int priority, std::string_view text) override;
+};
+
+// The general message log alone: its lines, as their text, to standard error.
+class MessageLogSink final : public Sink {
+ public:
+  void write(int priority, std::string_view text) override;
+  bool wants(int priority) const override { return priority == kMessage; }
 };
 
 // Sends every line to each of its sinks that wants it.

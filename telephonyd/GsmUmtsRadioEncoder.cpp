@@ -210,15 +210,6 @@ std::vector<const Cell*> measuredNeighbours(const SimulatedNetwork& network, Acc
   return cells;
 }
 
-std::uint32_t unsignedOf(int value) {
-  if (value < 0) throw std::logic_error(std::to_string(value) + " is written as an unsigned field");
-  return static_cast<std::uint32_t>(value);
-}
-
-constexpr std::uint64_t periodsIn(std::chrono::milliseconds span) {
-  return static_cast<std::uint64_t>(span / LogCodeSimulator::kPeriod);
-}
-
 // Where the phone must be for a record to be due.
 enum class Where { Anywhere, Umts, UmtsConnected, UmtsRanking, UmtsDch, Gsm, GsmDedicated };
 
@@ -292,7 +283,7 @@ void GsmUmtsRadioEncoder::encode(const SimulatedNetwork& network, std::uint64_t 
   reportedPhaseChanges_ = network.phaseChanges();
   for (const Report& report : reports()) {
     if (!isAt(network, report.where)) continue;
-    if (!changed && period % periodsIn(report.every) != 0) continue;
+    if (!changed && period % LogCodeSimulator::periodsIn(report.every) != 0) continue;
     if (auto packet = (this->*report.build)(network, timestamp)) {
       out.push_back({std::make_shared<const Bytes>(std::move(*packet)), report.code});
     }

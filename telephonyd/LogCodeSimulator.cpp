@@ -7,17 +7,15 @@
 #include "telephonyd/GsmUmtsRadioEncoder.h"
 #include "telephonyd/LogRecord.h"
 #include "telephonyd/LteRadioEncoder.h"
+#include "telephonyd/UtranRadioEncoder.h"
 
 namespace corvane::telephonyd {
 
 namespace {
 
-constexpr std::uint64_t periodsIn(std::chrono::milliseconds span) {
-  return static_cast<std::uint64_t>(span / LogCodeSimulator::kPeriod);
-}
-
 constexpr std::uint64_t kPeriodsPerMeasurement =
-    periodsIn(std::chrono::duration_cast<std::chrono::milliseconds>(SimulatedNetwork::kMeasurementPeriod));
+    LogCodeSimulator::periodsIn(
+        std::chrono::duration_cast<std::chrono::milliseconds>(SimulatedNetwork::kMeasurementPeriod));
 static_assert(kPeriodsPerMeasurement * LogCodeSimulator::kPeriod == SimulatedNetwork::kMeasurementPeriod,
               "measurements fall on period starts");
 
@@ -65,8 +63,8 @@ SourcePacket LogCodeSimulator::nextPacket() {
 
 void ExtraCodeEncoder::encode(const SimulatedNetwork& network, std::uint64_t period, std::uint64_t timestamp,
                               std::vector<SourcePacket>& out) {
-  static constexpr std::uint64_t kSimFilesPeriods = periodsIn(kSimFilesEvery);
-  static constexpr std::uint64_t kPdpPeriods = periodsIn(kPdpContextsEvery);
+  static constexpr std::uint64_t kSimFilesPeriods = LogCodeSimulator::periodsIn(kSimFilesEvery);
+  static constexpr std::uint64_t kPdpPeriods = LogCodeSimulator::periodsIn(kPdpContextsEvery);
   if (period % kSimFilesPeriods == 0) out.push_back(extraCodePacket(0, timestamp, network.simFiles()));
   if (period % kPeriodsPerMeasurement == 0) out.push_back(extraCodePacket(1, timestamp, network.cellList()));
   if (period % kPdpPeriods == 0 || network.pdpGeneration() != reportedPdpGeneration_) {
@@ -83,6 +81,7 @@ std::unique_ptr<LogCodeSimulator> makeLogCodeScenario(std::string_view technolog
   if (technology == kLogChannelTechnologyQuendraLTE) scenario->addEncoder(std::make_unique<LteRadioEncoder>());
   if (technology == kLogChannelTechnologyQuendraGSM) scenario->addEncoder(std::make_unique<GsmUmtsRadioEncoder>());
   if (technology == kLogChannelTechnologyQuendraCDMA) scenario->addEncoder(std::make_unique<CdmaRadioEncoder>(seed));
+  if (technology == kLogChannelTechnologyQuendraUTRAN2) scenario->addEncoder(std::make_unique<UtranRadioEncoder>());
   return scenario;
 }
 

@@ -31,6 +31,10 @@ namespace corvane::telephonyd {
 class LogCodeSimulator final : public PacketSource {
  public:
   static constexpr std::chrono::milliseconds kPeriod{40};
+  // The periods in a span that is a whole number of them.
+  static constexpr std::uint64_t periodsIn(std::chrono::milliseconds span) {
+    return static_cast<std::uint64_t>(span / kPeriod);
+  }
 
   class Encoder {
    public:

@@ -138,10 +138,6 @@ std::uint32_t subframeNumberAt(std::uint64_t timestamp) {
   return static_cast<std::uint32_t>(milliseconds % 10240);
 }
 
-constexpr std::uint64_t periodsIn(std::chrono::milliseconds span) {
-  return static_cast<std::uint64_t>(span / LogCodeSimulator::kPeriod);
-}
-
 }  // namespace
 
 // --- Schedule ---
@@ -173,7 +169,7 @@ void LteRadioEncoder::encode(const SimulatedNetwork& network, std::uint64_t peri
   const bool cellChanged = network.cellChanges() != reportedCellChanges_;
   reportedCellChanges_ = network.cellChanges();
   for (const Report& report : reports()) {
-    if (!cellChanged && period % periodsIn(report.every) != 0) continue;
+    if (!cellChanged && period % LogCodeSimulator::periodsIn(report.every) != 0) continue;
     if (auto packet = (this->*report.build)(network, timestamp)) {
       out.push_back({std::make_shared<const Bytes>(std::move(*packet)), report.code});
     }

@@ -12,6 +12,8 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <stdexcept>
+#include <string>
 
 #include "LogGenerator/records/Field.h"
 #include "platform/Value.h"
@@ -20,6 +22,13 @@ namespace corvane::telephonyd {
 
 // A field of a record layout, as the decoders read it.
 using RecordField = records::Field;
+
+// A count or identity of the simulated network, for an unsigned field.
+// Throws std::logic_error for a negative one.
+inline std::uint32_t unsignedOf(int value) {
+  if (value < 0) throw std::logic_error(std::to_string(value) + " is written as an unsigned field");
+  return static_cast<std::uint32_t>(value);
+}
 
 class RecordWriter {
  public:

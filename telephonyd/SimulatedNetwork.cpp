@@ -224,6 +224,7 @@ SimulatedNetwork::SimulatedNetwork(std::string_view technology, std::uint64_t se
   } else if (technology == kLogChannelTechnologyQuendraUTRAN2) {
     addCells(Access::UTRAN2, 5, areaCode);
     addCells(Access::GSM, 3, areaCode);
+    planUtran2Cells(seed);
   } else if (technology == kLogChannelTechnologyQuendraLTE) {
     addCells(Access::LTE, 6, areaCode);
     for (Cell& cell : cells_) {
@@ -591,6 +592,7 @@ void SimulatedNetwork::step() {
   for (std::size_t i = 0; i < plannedCells_; ++i) drift(cells_[i]);
   if (cells_[serving_].access == Access::LTE) stepDetectedCells();
   if (journeys_) moveAlongJourney();
+  if (utranRrc_) utranRrc_->step();
   const Cell& serving = cells_[serving_];
   for (Cell& cell : cells_) {
     const bool clearlyStronger = !cell.serving && cell.measured && cell.access == serving.access &&
@@ -625,6 +627,22 @@ void SimulatedNetwork::step() {
     ++pdpGeneration_;
   }
 }
+
+// --- The UTRAN2 phone ---
+
+void SimulatedNetwork::planUtran2Cells(std::uint64_t seed) {
+  // A stream of its own: the cells, SIM and PDP contexts of a seed stay as they were.
+  SeededRandom planning(seed ^ 0x8CB92BA72F3D8DD7u);
+  for (Cell& cell : cells_) {
+    if (cell.access != Access::GSM) continue;
+    // The UTRAN2 baseband reports a GSM cell's identity in 14 bits.
+    cell.cellId = cell.cellId % 0x3FFF + 1;
+    cell.code = planning.uniform(0, 63);  // NCC and BCC
+  }
+  utranRrc_.emplace(seed);
+}
+
+int SimulatedNetwork::utranRegistrationArea(const Cell& cell) const { return cell.areaCode % 255 + 1; }
 
 Dictionary SimulatedNetwork::cellFields(const Cell& cell) const {
   Dictionary fields;

@@ -66,12 +66,14 @@
 
 #include <chrono>
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
 
 #include "platform/Value.h"
 #include "telephonyd/SeededRandom.h"
+#include "telephonyd/UtranRrcJourney.h"
 
 namespace corvane::telephonyd {
 
@@ -155,6 +157,11 @@ class SimulatedNetwork {
   // The URA of a UMTS cell: one per location area.
   int uraIdentity(const Cell& cell) const;
 
+  // The UTRAN2 phone: its RRC states (UtranRrcJourney.h), and the URA of a
+  // cell, one per location area, as one byte. Nothing on the other networks.
+  const UtranRrcJourney* utranRrc() const { return utranRrc_ ? &*utranRrc_ : nullptr; }
+  int utranRegistrationArea(const Cell& cell) const;
+
   static constexpr int kMobileCountryCode = 1;  // 001
   static constexpr int kMobileNetworkCode = 1;  // 01
 
@@ -204,6 +211,10 @@ class SimulatedNetwork {
   std::vector<std::size_t> activeSet_;  // indices into cells_
   int uraIdentity_ = 0;
   std::uint64_t cellChanges_ = 0;
+
+  // The UTRAN2 phone.
+  void planUtran2Cells(std::uint64_t seed);
+  std::optional<UtranRrcJourney> utranRrc_;
 
   // SIM
   std::string imsi_;

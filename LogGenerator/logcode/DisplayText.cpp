@@ -72,6 +72,15 @@ Text wholeText(std::int64_t value, const records::Unit& unit) {
   return text;
 }
 
+Text floatText(double value) {
+  // to_chars rounds to six decimals as printf's "%f" does; a number too long
+  // for the text is cut at its capacity.
+  Text text;
+  const auto result = std::to_chars(text.begin(), text.begin() + Text::kCapacity, value, std::chars_format::fixed, 6);
+  text.setEnd(result.ec == std::errc() ? result.ptr : text.begin() + Text::kCapacity);
+  return text;
+}
+
 Text fixedText(double value, const records::Unit& unit) {
   // Every fixed-point field of the records is a whole number of eighths once
   // converted, which these texts write with integer arithmetic, without a

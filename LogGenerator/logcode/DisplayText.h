@@ -44,6 +44,8 @@ Text decimalText(std::int32_t value);
 Text wholeText(std::int64_t value, const records::Unit& unit);
 // "%4.2f" followed by the unit, exactly as printf writes the double.
 Text fixedText(double value, const records::Unit& unit);
+// "%f": six decimals, no unit.
+Text floatText(double value);
 // fixedText of eighths / 8, in integer arithmetic.
 Text eighthsText(std::int64_t eighths, const records::Unit& unit);
 inline std::string_view trueFalseText(bool value) { return value ? "True" : "False"; }
@@ -70,6 +72,7 @@ constexpr std::string_view textFor(std::span<const records::ValueText> table, st
     case Kind::Whole: return wholeText(conversion.wholeValue(raw), conversion.unit);
     case Kind::Table: return Text(textFor(conversion.table, raw, conversion.fallback));
     case Kind::Flag: return Text(trueFalseText(raw != 0));
+    case Kind::Float: return floatText(conversion.value(raw));
   }
   return Text();
 }

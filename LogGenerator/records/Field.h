@@ -59,6 +59,7 @@ struct Conversion {
     Whole,    // "%d<unit>" of x × step + origin, taken as a signed 16-bit number
     Table,    // the text of a value table, or the fallback
     Flag,     // "True" for any bit set, else "False"
+    Float,    // "%f" of x × step + origin, in double precision
   };
 
   Kind kind = Kind::Decimal;
@@ -88,7 +89,8 @@ struct Conversion {
   // (signed) otherwise.
   double value(std::uint32_t raw) const {
     switch (kind) {
-      case Kind::Fixed: return raw * step + origin;
+      case Kind::Fixed:
+      case Kind::Float: return raw * step + origin;
       case Kind::Whole: return wholeValue(raw);
       case Kind::Unsigned: return raw;
       default: return static_cast<std::int32_t>(raw);
@@ -143,6 +145,13 @@ constexpr Conversion fixed(double step, double origin, std::string_view unit) {
     c.eighthStep = static_cast<std::int64_t>(eighthStep);
     c.eighthOrigin = static_cast<std::int64_t>(eighthOrigin);
   }
+  return c;
+}
+constexpr Conversion floating(double step, double origin) {
+  Conversion c;
+  c.kind = Conversion::Kind::Float;
+  c.step = step;
+  c.origin = origin;
   return c;
 }
 constexpr Conversion whole(int step, int origin, std::string_view unit) {

@@ -433,6 +433,89 @@ class ScreenshotTest : public QObject {
       QVERIFY(keep(window, QStringLiteral("cdma-data-rates")));
     }
   }
+
+  // The UTRAN2 phone on the UTRAN screens: the RRC state once on DCH, the
+  // serving cell, the neighbour cells and the CCTrCH SIR values of the
+  // dedicated channels, each waited on until it shows decoded values.
+  void theUtranScenarioShowsTheRrcStateTheCellsAndTheChannels() {
+    // About 25 packets a second: some four simulated seconds for each real one.
+    LiveService service({"--technology", "Quendra_UTRAN2", "--seed", "5", "--rate", "25"});
+    QVERIFY2(service.platform_, service.error_.c_str());
+    QTRY_VERIFY_WITH_TIMEOUT(service.listening(), 10000);
+
+    Preferences preferences(service.configDirectory());
+    {
+      CorvaneApp app(CorvaneAppEnvironment{service.platform_->environment(), preferences, service.root_});
+      QVERIFY(launch(app));
+      QWidget* window = app.window();
+      NavigationController* navigation = app.navigationController();
+      auto top = [&] { return qobject_cast<CorvanePaneController*>(navigation->topViewController()); };
+      QTRY_VERIFY_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 4, 20000);
+      auto open = [&](const QString& key) {
+        const int row = test::rowWithKey(top(), key);
+        if (row < 0) return false;
+        test::tapRow(top(), row);
+        return true;
+      };
+      auto openSection = [&](const QString& group, const QString& section) {
+        navigation->popToViewController(navigation->viewControllers().front(), false);
+        return open(group) && open(section);
+      };
+      auto valueOf = [&](const QString& key) {
+        const int row = test::rowWithKey(top(), key);
+        return row < 0 || !test::cellAt(top(), row)->value ? QString() : test::cellAt(top(), row)->value->text();
+      };
+      auto rowsText = [&] {
+        QStringList rows;
+        for (int i = 0; i < top()->tableView()->numberOfRows(); ++i) {
+          const CorvaneCell* cell = test::cellAt(top(), i);
+          rows << cell->key->text() + QLatin1Char('=') + (cell->value ? cell->value->text() : QString());
+        }
+        return rows.join(QStringLiteral(", "));
+      };
+      // Rows that hold values hold decoded ones: none is empty or the template's "-".
+      auto decoded = [&] {
+        if (top()->tableView()->numberOfRows() == 0) return false;
+        for (int i = 0; i < top()->tableView()->numberOfRows(); ++i) {
+          const CorvaneCell* cell = test::cellAt(top(), i);
+          if (cell->value && (cell->value->text().isEmpty() || cell->value->text() == QLatin1String("-"))) return false;
+        }
+        return true;
+      };
+      // Several rounds of RRC states at this pace.
+      constexpr int kJourney = 60000;
+
+      QVERIFY(openSection(QStringLiteral("Serving Cell"), QStringLiteral("RRC Info")));
+      QTRY_VERIFY2_WITH_TIMEOUT(valueOf(QStringLiteral("State")) == QLatin1String("Cell DCH"), qPrintable(rowsText()),
+                                kJourney);
+      QVERIFY(keep(window, QStringLiteral("utran-rrc-info")));
+
+      QVERIFY(openSection(QStringLiteral("Serving Cell"), QStringLiteral("Serving Cell Info")));
+      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), 10000);
+      QCOMPARE(valueOf(QStringLiteral("Uplink UARFCN")), valueOf(QStringLiteral("Downlink UARFCN")));
+      QVERIFY(keep(window, QStringLiteral("utran-serving-cell-info")));
+      const QString scramblingCode = valueOf(QStringLiteral("Cell Scrambling Code"));
+
+      QVERIFY(openSection(QStringLiteral("Neighbours"), QStringLiteral("Neighbor Cell List")));
+      QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 3, qPrintable(rowsText()), 10000);
+      QVERIFY(keep(window, QStringLiteral("utran-neighbor-cell-list")));
+      QVERIFY(open(QStringLiteral("0")));
+      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), 10000);
+      QCOMPARE(valueOf(QStringLiteral("Status")), QStringLiteral("ASET"));
+      QCOMPARE(valueOf(QStringLiteral("Cell ID")), scramblingCode);
+      QVERIFY(keep(window, QStringLiteral("utran-neighbor-cell")));
+
+      QVERIFY(openSection(QStringLiteral("Channel Quality"), QStringLiteral("CCTRCH SIR")));
+      QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 1, qPrintable(rowsText()), kJourney);
+      QVERIFY(open(QStringLiteral("0")));
+      QTRY_VERIFY2_WITH_TIMEOUT(decoded() && test::rowWithKey(top(), QStringLiteral("SIR")) >= 0,
+                                qPrintable(rowsText()), 10000);
+      QVERIFY(keep(window, QStringLiteral("utran-cctrch-sir")));
+      QVERIFY(open(QStringLiteral("SIR")));
+      QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() == 6 && decoded(), qPrintable(rowsText()), 10000);
+      QVERIFY(keep(window, QStringLiteral("utran-cctrch-sir-values")));
+    }
+  }
 };
 
 }  // namespace corvane

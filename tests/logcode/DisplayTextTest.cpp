@@ -83,5 +83,15 @@ TEST(DisplayText, ATableTextLongerThanAMadeTextIsShownWhole) {
   EXPECT_EQ(conversionText(kTable, 1).view(), "MM_WAIT_FOR_ADDITIONAL_OUTGOING_MM_ CONNECTION");
 }
 
+// "%f" rounds to six decimals as printf does: 1/256 and 255/256 are cut.
+TEST(DisplayText, FloatTextWritesWhatPrintfWritesWithSixDecimals) {
+  for (std::uint32_t raw : {0u, 1u, 77u, 128u, 255u}) {
+    char printed[32];
+    std::snprintf(printed, sizeof printed, "%f", raw * 0.00390625);
+    EXPECT_EQ(conversionText(records::floating(0.00390625, 0), raw).view(), std::string_view(printed)) << raw;
+  }
+  EXPECT_EQ(floatText(-2.5).view(), "-2.500000");
+}
+
 }  // namespace
 }  // namespace corvane

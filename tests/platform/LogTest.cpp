@@ -375,3 +375,18 @@ TEST(Log, TheSyslogSinkKeepsReachingALogDaemonThatRestartsGoesAndComesBack) {
 
 }  // namespace
 }  // namespace corvane
+
+namespace corvane {
+namespace {
+
+TEST(Log, TheMessageLogNeverGoesToTheSystemLogAndTheMessageSinkTakesNothingElse) {
+  log::SyslogSink syslog([] { return true; }, std::chrono::steady_clock::now);
+  EXPECT_FALSE(syslog.wants(log::kMessage));
+  log::MessageLogSink messages;
+  EXPECT_TRUE(messages.wants(log::kMessage));
+  EXPECT_FALSE(messages.wants(log::kWarning));
+  EXPECT_FALSE(messages.wants(16));
+}
+
+}  // namespace
+}  // namespace corvane

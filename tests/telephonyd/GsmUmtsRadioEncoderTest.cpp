@@ -70,18 +70,9 @@ std::vector<std::string> stringsIn(const Value& display, std::string_view sectio
 }
 
 // The GSM/UMTS decoder, fed packet by packet.
-class GsmUmtsDecoder {
+class GsmUmtsDecoder : public scenario::Decoder {
  public:
-  GsmUmtsDecoder() : generator_(LogGenerator::generatorFromTechnology(kLogChannelTechnologyQuendraGSM)) {}
-  void feed(const Period& period) {
-    for (const SourcePacket& packet : period.packets) generator_->updateState(state_, *packet.data);
-  }
-  Value display() { return generator_->generateLogUsingState(state_); }
-
- private:
-  log::ScopedCapture quiet_;
-  std::unique_ptr<LogGenerator> generator_;
-  Dictionary state_;
+  GsmUmtsDecoder() : Decoder(kLogChannelTechnologyQuendraGSM) {}
 };
 
 std::string number(long long value) { return std::to_string(value); }

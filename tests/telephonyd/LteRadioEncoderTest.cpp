@@ -68,18 +68,9 @@ Period periodNumber(std::uint64_t seed, std::uint64_t number) {
 // --- Reading the display ---
 
 // The LTE decoder, fed packet by packet.
-class LteDecoder {
+class LteDecoder : public scenario::Decoder {
  public:
-  LteDecoder() : generator_(LogGenerator::generatorFromTechnology(kLogChannelTechnologyQuendraLTE)) {}
-  void feed(const Period& period) {
-    for (const SourcePacket& packet : period.packets) generator_->updateState(state_, *packet.data);
-  }
-  Value display() { return generator_->generateLogUsingState(state_); }
-
- private:
-  log::ScopedCapture quiet_;
-  std::unique_ptr<LogGenerator> generator_;
-  Dictionary state_;
+  LteDecoder() : Decoder(kLogChannelTechnologyQuendraLTE) {}
 };
 
 // --- Expected texts, written here as the display writes them ---

@@ -14,6 +14,8 @@
 #include <string_view>
 #include <vector>
 
+#include "LogGenerator/LogGenerator.h"
+#include "platform/Log.h"
 #include "platform/Value.h"
 #include "telephonyd/LogCodeSimulator.h"
 #include "telephonyd/LogRecord.h"
@@ -138,5 +140,20 @@ inline std::vector<Dictionary> listRows(const Value& display, std::string_view s
   for (const Value& row : list->asArray()->elements()) rows.push_back(*row.asDictionary());
   return rows;
 }
+
+// A technology's own decoder, fed period by period, its log lines captured.
+class Decoder {
+ public:
+  explicit Decoder(std::string_view technology) : generator_(LogGenerator::generatorFromTechnology(technology)) {}
+  void feed(const Period& period) {
+    for (const SourcePacket& packet : period.packets) generator_->updateState(state_, *packet.data);
+  }
+  Value display() { return generator_->generateLogUsingState(state_); }
+
+ private:
+  log::ScopedCapture quiet_;
+  std::unique_ptr<LogGenerator> generator_;
+  Dictionary state_;
+};
 
 }  // namespace corvane::telephonyd::scenario
