@@ -64,6 +64,49 @@ bool launch(CorvaneApp& app) {
   return QTest::qWaitForWindowExposed(app.window());
 }
 
+// Walks the application's screens as a user taps through them.
+struct Screens {
+  NavigationController* navigation;
+
+  CorvanePaneController* top() const {
+    return qobject_cast<CorvanePaneController*>(navigation->topViewController());
+  }
+  // Taps the row with the key on the top screen; false when it has none.
+  bool open(const QString& key) const {
+    const int row = test::rowWithKey(top(), key);
+    if (row < 0) return false;
+    test::tapRow(top(), row);
+    return true;
+  }
+  // From the root screen, a group and a section in it.
+  bool openSection(const QString& group, const QString& section) const {
+    navigation->popToViewController(navigation->viewControllers().front(), false);
+    return open(group) && (section.isEmpty() || open(section));
+  }
+  QString valueOf(const QString& key) const {
+    const int row = test::rowWithKey(top(), key);
+    return row < 0 || !test::cellAt(top(), row)->value ? QString() : test::cellAt(top(), row)->value->text();
+  }
+  // Every row of the top screen, key and value; a list's rows open entries and have no value.
+  QString rowsText() const {
+    QStringList rows;
+    for (int i = 0; i < top()->tableView()->numberOfRows(); ++i) {
+      const CorvaneCell* cell = test::cellAt(top(), i);
+      rows << cell->key->text() + QLatin1Char('=') + (cell->value ? cell->value->text() : QString());
+    }
+    return rows.join(QStringLiteral(", "));
+  }
+  // Rows that hold values hold decoded ones: none is empty or the template's "-".
+  bool decoded() const {
+    if (top()->tableView()->numberOfRows() == 0) return false;
+    for (int i = 0; i < top()->tableView()->numberOfRows(); ++i) {
+      const CorvaneCell* cell = test::cellAt(top(), i);
+      if (cell->value && (cell->value->text().isEmpty() || cell->value->text() == QLatin1String("-"))) return false;
+    }
+    return true;
+  }
+};
+
 }  // namespace
 
 class ScreenshotTest : public QObject {
@@ -271,38 +314,12 @@ class ScreenshotTest : public QObject {
       QTRY_VERIFY_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 4, 20000);
       QCOMPARE(test::cellAt(top(), 0)->key->text(), QStringLiteral("Serving Cell"));
 
-      auto open = [&](const QString& key) {
-        const int row = test::rowWithKey(top(), key);
-        if (row < 0) return false;
-        test::tapRow(top(), row);
-        return true;
-      };
-      auto openSection = [&](const QString& group, const QString& section) {
-        navigation->popToViewController(navigation->viewControllers().front(), false);
-        return open(group) && open(section);
-      };
-      auto valueOf = [&](const QString& key) {
-        const int row = test::rowWithKey(top(), key);
-        return row < 0 || !test::cellAt(top(), row)->value ? QString() : test::cellAt(top(), row)->value->text();
-      };
-      // A list's rows open entries and have no value.
-      auto rowsText = [&] {
-        QStringList rows;
-        for (int i = 0; i < top()->tableView()->numberOfRows(); ++i) {
-          const CorvaneCell* cell = test::cellAt(top(), i);
-          rows << cell->key->text() + QLatin1Char('=') + (cell->value ? cell->value->text() : QString());
-        }
-        return rows.join(QStringLiteral(", "));
-      };
-      // Rows all hold decoded values: none is empty or the template's "-".
-      auto decoded = [&] {
-        if (top()->tableView()->numberOfRows() == 0) return false;
-        for (int i = 0; i < top()->tableView()->numberOfRows(); ++i) {
-          const QString value = test::cellAt(top(), i)->value->text();
-          if (value.isEmpty() || value == QLatin1String("-")) return false;
-        }
-        return true;
-      };
+      const Screens screens{navigation};
+      auto open = [&](const QString& key) { return screens.open(key); };
+      auto openSection = [&](const QString& group, const QString& section) { return screens.openSection(group, section); };
+      auto valueOf = [&](const QString& key) { return screens.valueOf(key); };
+      auto rowsText = [&] { return screens.rowsText(); };
+      auto decoded = [&] { return screens.decoded(); };
       // Several journeys at this pace.
       constexpr int kJourney = 60000;
 
@@ -396,17 +413,9 @@ class ScreenshotTest : public QObject {
       QTRY_VERIFY_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 4, 20000);
       QCOMPARE(test::cellAt(top(), 0)->key->text(), QStringLiteral("Summary"));
 
-      auto openGroup = [&](const QString& group) {
-        navigation->popToViewController(navigation->viewControllers().front(), false);
-        const int row = test::rowWithKey(top(), group);
-        if (row < 0) return false;
-        test::tapRow(top(), row);
-        return true;
-      };
-      auto valueOf = [&](const QString& key) {
-        const int row = test::rowWithKey(top(), key);
-        return row < 0 || !test::cellAt(top(), row)->value ? QString() : test::cellAt(top(), row)->value->text();
-      };
+      const Screens screens{navigation};
+      auto openGroup = [&](const QString& group) { return screens.openSection(group, QString()); };
+      auto valueOf = [&](const QString& key) { return screens.valueOf(key); };
       // A whole journey at this pace, with room to spare.
       constexpr int kJourney = 60000;
 
@@ -451,37 +460,12 @@ class ScreenshotTest : public QObject {
       NavigationController* navigation = app.navigationController();
       auto top = [&] { return qobject_cast<CorvanePaneController*>(navigation->topViewController()); };
       QTRY_VERIFY_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 4, 20000);
-      auto open = [&](const QString& key) {
-        const int row = test::rowWithKey(top(), key);
-        if (row < 0) return false;
-        test::tapRow(top(), row);
-        return true;
-      };
-      auto openSection = [&](const QString& group, const QString& section) {
-        navigation->popToViewController(navigation->viewControllers().front(), false);
-        return open(group) && open(section);
-      };
-      auto valueOf = [&](const QString& key) {
-        const int row = test::rowWithKey(top(), key);
-        return row < 0 || !test::cellAt(top(), row)->value ? QString() : test::cellAt(top(), row)->value->text();
-      };
-      auto rowsText = [&] {
-        QStringList rows;
-        for (int i = 0; i < top()->tableView()->numberOfRows(); ++i) {
-          const CorvaneCell* cell = test::cellAt(top(), i);
-          rows << cell->key->text() + QLatin1Char('=') + (cell->value ? cell->value->text() : QString());
-        }
-        return rows.join(QStringLiteral(", "));
-      };
-      // Rows that hold values hold decoded ones: none is empty or the template's "-".
-      auto decoded = [&] {
-        if (top()->tableView()->numberOfRows() == 0) return false;
-        for (int i = 0; i < top()->tableView()->numberOfRows(); ++i) {
-          const CorvaneCell* cell = test::cellAt(top(), i);
-          if (cell->value && (cell->value->text().isEmpty() || cell->value->text() == QLatin1String("-"))) return false;
-        }
-        return true;
-      };
+      const Screens screens{navigation};
+      auto open = [&](const QString& key) { return screens.open(key); };
+      auto openSection = [&](const QString& group, const QString& section) { return screens.openSection(group, section); };
+      auto valueOf = [&](const QString& key) { return screens.valueOf(key); };
+      auto rowsText = [&] { return screens.rowsText(); };
+      auto decoded = [&] { return screens.decoded(); };
       // Several rounds of RRC states at this pace.
       constexpr int kJourney = 60000;
 
