@@ -315,83 +315,78 @@ class ScreenshotTest : public QObject {
       QCOMPARE(test::cellAt(top(), 0)->key->text(), QStringLiteral("Serving Cell"));
 
       const Screens screens{navigation};
-      auto open = [&](const QString& key) { return screens.open(key); };
-      auto openSection = [&](const QString& group, const QString& section) { return screens.openSection(group, section); };
-      auto valueOf = [&](const QString& key) { return screens.valueOf(key); };
-      auto rowsText = [&] { return screens.rowsText(); };
-      auto decoded = [&] { return screens.decoded(); };
       // Several journeys at this pace.
       constexpr int kJourney = 60000;
 
-      QVERIFY(openSection(QStringLiteral("Serving Cell"), QStringLiteral("Serving PLMN")));
-      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), kJourney);
-      QVERIFY(valueOf(QStringLiteral("Mobile Country Code")) == QLatin1String("1") ||
-              valueOf(QStringLiteral("Mobile Country Code")) == QLatin1String("001"));
+      QVERIFY(screens.openSection(QStringLiteral("Serving Cell"), QStringLiteral("Serving PLMN")));
+      QTRY_VERIFY2_WITH_TIMEOUT(screens.decoded(), qPrintable(screens.rowsText()), kJourney);
+      QVERIFY(screens.valueOf(QStringLiteral("Mobile Country Code")) == QLatin1String("1") ||
+              screens.valueOf(QStringLiteral("Mobile Country Code")) == QLatin1String("001"));
       QVERIFY(keep(window, QStringLiteral("gsm-serving-plmn")));
 
       // CELL_DCH with soft handover: two or three cells in the active set.
-      QVERIFY(openSection(QStringLiteral("Neighbours"), QStringLiteral("Active Set")));
-      QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 2, qPrintable(rowsText()), kJourney);
+      QVERIFY(screens.openSection(QStringLiteral("Neighbours"), QStringLiteral("Active Set")));
+      QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 2, qPrintable(screens.rowsText()), kJourney);
       QVERIFY(keep(window, QStringLiteral("gsm-active-set-list")));
-      QVERIFY(open(QStringLiteral("0")));
-      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), 10000);
-      QVERIFY(valueOf(QStringLiteral("RSCP")).endsWith(QStringLiteral(" dB")));
+      QVERIFY(screens.open(QStringLiteral("0")));
+      QTRY_VERIFY2_WITH_TIMEOUT(screens.decoded(), qPrintable(screens.rowsText()), 10000);
+      QVERIFY(screens.valueOf(QStringLiteral("RSCP")).endsWith(QStringLiteral(" dB")));
       QVERIFY(keep(window, QStringLiteral("gsm-active-set")));
 
-      QVERIFY(openSection(QStringLiteral("Serving Cell"), QStringLiteral("UMTS RR Info")));
-      QTRY_VERIFY2_WITH_TIMEOUT(decoded() && valueOf(QStringLiteral("RRC State")) == QLatin1String("CELL_DCH") &&
-                                    valueOf(QStringLiteral("Ciphering")) == QLatin1String("Enabled"),
-                                qPrintable(rowsText()), kJourney);
-      QVERIFY(valueOf(QStringLiteral("Transmit Power")).endsWith(QStringLiteral(" dBm")));
+      QVERIFY(screens.openSection(QStringLiteral("Serving Cell"), QStringLiteral("UMTS RR Info")));
+      QTRY_VERIFY2_WITH_TIMEOUT(screens.decoded() && screens.valueOf(QStringLiteral("RRC State")) == QLatin1String("CELL_DCH") &&
+                                    screens.valueOf(QStringLiteral("Ciphering")) == QLatin1String("Enabled"),
+                                qPrintable(screens.rowsText()), kJourney);
+      QVERIFY(screens.valueOf(QStringLiteral("Transmit Power")).endsWith(QStringLiteral(" dBm")));
       QVERIFY(keep(window, QStringLiteral("gsm-umts-rr-info")));
 
       // On GSM, on a hopping channel: every row of the serving cell filled.
-      QVERIFY(openSection(QStringLiteral("Serving Cell"), QStringLiteral("GSM Serving Cell")));
-      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), kJourney);
-      QVERIFY(valueOf(QStringLiteral("RSSI")).endsWith(QStringLiteral(" dBm")));
+      QVERIFY(screens.openSection(QStringLiteral("Serving Cell"), QStringLiteral("GSM Serving Cell")));
+      QTRY_VERIFY2_WITH_TIMEOUT(screens.decoded(), qPrintable(screens.rowsText()), kJourney);
+      QVERIFY(screens.valueOf(QStringLiteral("RSSI")).endsWith(QStringLiteral(" dBm")));
       QVERIFY(keep(window, QStringLiteral("gsm-serving-cell")));
 
       // The neighbours of 0x5137 carry the BSICs of 0x51FF.
-      QVERIFY(openSection(QStringLiteral("Neighbours"), QStringLiteral("Neighboring Cells")));
+      QVERIFY(screens.openSection(QStringLiteral("Neighbours"), QStringLiteral("Neighboring Cells")));
       QTRY_VERIFY_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 1, kJourney);
-      QVERIFY(open(QStringLiteral("0")));
-      QTRY_VERIFY2_WITH_TIMEOUT(decoded() && test::rowWithKey(top(), QStringLiteral("BSIC")) >= 0 &&
+      QVERIFY(screens.open(QStringLiteral("0")));
+      QTRY_VERIFY2_WITH_TIMEOUT(screens.decoded() && test::rowWithKey(top(), QStringLiteral("BSIC")) >= 0 &&
                                     test::rowWithKey(top(), QStringLiteral("C1 Value")) >= 0,
-                                qPrintable(rowsText()), kJourney);
+                                qPrintable(screens.rowsText()), kJourney);
       QVERIFY(keep(window, QStringLiteral("gsm-neighboring-cell")));
       navigation->popViewControllerAnimated(false);
       QVERIFY(top()->tableView()->numberOfRows() >= 1);
       QVERIFY(keep(window, QStringLiteral("gsm-neighboring-cells-list")));
 
       // Still on GSM: the radio resource layer and the cell's GPRS parameters.
-      QVERIFY(openSection(QStringLiteral("Radio Resource"), QStringLiteral("GSM RR Info")));
-      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), kJourney);
-      QVERIFY(valueOf(QStringLiteral("DRX Used")).endsWith(QStringLiteral(" sec")));
+      QVERIFY(screens.openSection(QStringLiteral("Radio Resource"), QStringLiteral("GSM RR Info")));
+      QTRY_VERIFY2_WITH_TIMEOUT(screens.decoded(), qPrintable(screens.rowsText()), kJourney);
+      QVERIFY(screens.valueOf(QStringLiteral("DRX Used")).endsWith(QStringLiteral(" sec")));
       QVERIFY(keep(window, QStringLiteral("gsm-rr-info")));
-      QVERIFY(openSection(QStringLiteral("Packet Data"), QStringLiteral("GPRS Information")));
-      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), kJourney);
+      QVERIFY(screens.openSection(QStringLiteral("Packet Data"), QStringLiteral("GPRS Information")));
+      QTRY_VERIFY2_WITH_TIMEOUT(screens.decoded(), qPrintable(screens.rowsText()), kJourney);
       QVERIFY(keep(window, QStringLiteral("gsm-gprs-information")));
 
       // A call on GSM: an MM connection, and GPRS suspended meanwhile.
-      QVERIFY(openSection(QStringLiteral("Mobility"), QStringLiteral("Process CS")));
-      QTRY_VERIFY2_WITH_TIMEOUT(decoded() && valueOf(QStringLiteral("MM State")) == QLatin1String("MM_CONNECTION_ACTIVE"),
-                                qPrintable(rowsText()), kJourney);
+      QVERIFY(screens.openSection(QStringLiteral("Mobility"), QStringLiteral("Process CS")));
+      QTRY_VERIFY2_WITH_TIMEOUT(screens.decoded() && screens.valueOf(QStringLiteral("MM State")) == QLatin1String("MM_CONNECTION_ACTIVE"),
+                                qPrintable(screens.rowsText()), kJourney);
       QVERIFY(keep(window, QStringLiteral("gsm-process-cs")));
-      QVERIFY(openSection(QStringLiteral("Mobility"), QStringLiteral("Process PS")));
-      QTRY_VERIFY2_WITH_TIMEOUT(decoded() && valueOf(QStringLiteral("MM Sub State")) == QLatin1String("GMM_SUSPENDED"),
-                                qPrintable(rowsText()), kJourney);
+      QVERIFY(screens.openSection(QStringLiteral("Mobility"), QStringLiteral("Process PS")));
+      QTRY_VERIFY2_WITH_TIMEOUT(screens.decoded() && screens.valueOf(QStringLiteral("MM Sub State")) == QLatin1String("GMM_SUSPENDED"),
+                                qPrintable(screens.rowsText()), kJourney);
       QVERIFY(keep(window, QStringLiteral("gsm-process-ps")));
 
       // HSDPA from the last stay in CELL_DCH: its HARQ processes are list rows.
-      QVERIFY(openSection(QStringLiteral("Packet Data"), QStringLiteral("HSDPA Info")));
-      QTRY_VERIFY2_WITH_TIMEOUT(valueOf(QStringLiteral("Carrier Info")) == QLatin1String("Dual Carrier") &&
+      QVERIFY(screens.openSection(QStringLiteral("Packet Data"), QStringLiteral("HSDPA Info")));
+      QTRY_VERIFY2_WITH_TIMEOUT(screens.valueOf(QStringLiteral("Carrier Info")) == QLatin1String("Dual Carrier") &&
                                     test::rowWithKey(top(), QStringLiteral("Secondary HARQ Process")) >= 0,
-                                qPrintable(rowsText()), kJourney);
+                                qPrintable(screens.rowsText()), kJourney);
       QVERIFY(keep(window, QStringLiteral("gsm-hsdpa-info")));
-      QVERIFY(open(QStringLiteral("Primary HARQ Process")));
-      QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() == 6, qPrintable(rowsText()), 10000);
-      QVERIFY(open(QStringLiteral("0")));
-      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), 10000);
+      QVERIFY(screens.open(QStringLiteral("Primary HARQ Process")));
+      QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() == 6, qPrintable(screens.rowsText()), 10000);
+      QVERIFY(screens.open(QStringLiteral("0")));
+      QTRY_VERIFY2_WITH_TIMEOUT(screens.decoded(), qPrintable(screens.rowsText()), 10000);
       QVERIFY(keep(window, QStringLiteral("gsm-hsdpa-harq-process")));
     }
   }
@@ -461,42 +456,37 @@ class ScreenshotTest : public QObject {
       auto top = [&] { return qobject_cast<CorvanePaneController*>(navigation->topViewController()); };
       QTRY_VERIFY_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 4, 20000);
       const Screens screens{navigation};
-      auto open = [&](const QString& key) { return screens.open(key); };
-      auto openSection = [&](const QString& group, const QString& section) { return screens.openSection(group, section); };
-      auto valueOf = [&](const QString& key) { return screens.valueOf(key); };
-      auto rowsText = [&] { return screens.rowsText(); };
-      auto decoded = [&] { return screens.decoded(); };
       // Several rounds of RRC states at this pace.
       constexpr int kJourney = 60000;
 
-      QVERIFY(openSection(QStringLiteral("Serving Cell"), QStringLiteral("RRC Info")));
-      QTRY_VERIFY2_WITH_TIMEOUT(valueOf(QStringLiteral("State")) == QLatin1String("Cell DCH"), qPrintable(rowsText()),
+      QVERIFY(screens.openSection(QStringLiteral("Serving Cell"), QStringLiteral("RRC Info")));
+      QTRY_VERIFY2_WITH_TIMEOUT(screens.valueOf(QStringLiteral("State")) == QLatin1String("Cell DCH"), qPrintable(screens.rowsText()),
                                 kJourney);
       QVERIFY(keep(window, QStringLiteral("utran-rrc-info")));
 
-      QVERIFY(openSection(QStringLiteral("Serving Cell"), QStringLiteral("Serving Cell Info")));
-      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), 10000);
-      QCOMPARE(valueOf(QStringLiteral("Uplink UARFCN")), valueOf(QStringLiteral("Downlink UARFCN")));
+      QVERIFY(screens.openSection(QStringLiteral("Serving Cell"), QStringLiteral("Serving Cell Info")));
+      QTRY_VERIFY2_WITH_TIMEOUT(screens.decoded(), qPrintable(screens.rowsText()), 10000);
+      QCOMPARE(screens.valueOf(QStringLiteral("Uplink UARFCN")), screens.valueOf(QStringLiteral("Downlink UARFCN")));
       QVERIFY(keep(window, QStringLiteral("utran-serving-cell-info")));
-      const QString scramblingCode = valueOf(QStringLiteral("Cell Scrambling Code"));
+      const QString scramblingCode = screens.valueOf(QStringLiteral("Cell Scrambling Code"));
 
-      QVERIFY(openSection(QStringLiteral("Neighbours"), QStringLiteral("Neighbor Cell List")));
-      QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 3, qPrintable(rowsText()), 10000);
+      QVERIFY(screens.openSection(QStringLiteral("Neighbours"), QStringLiteral("Neighbor Cell List")));
+      QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 3, qPrintable(screens.rowsText()), 10000);
       QVERIFY(keep(window, QStringLiteral("utran-neighbor-cell-list")));
-      QVERIFY(open(QStringLiteral("0")));
-      QTRY_VERIFY2_WITH_TIMEOUT(decoded(), qPrintable(rowsText()), 10000);
-      QCOMPARE(valueOf(QStringLiteral("Status")), QStringLiteral("ASET"));
-      QCOMPARE(valueOf(QStringLiteral("Cell ID")), scramblingCode);
+      QVERIFY(screens.open(QStringLiteral("0")));
+      QTRY_VERIFY2_WITH_TIMEOUT(screens.decoded(), qPrintable(screens.rowsText()), 10000);
+      QCOMPARE(screens.valueOf(QStringLiteral("Status")), QStringLiteral("ASET"));
+      QCOMPARE(screens.valueOf(QStringLiteral("Cell ID")), scramblingCode);
       QVERIFY(keep(window, QStringLiteral("utran-neighbor-cell")));
 
-      QVERIFY(openSection(QStringLiteral("Channel Quality"), QStringLiteral("CCTRCH SIR")));
-      QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 1, qPrintable(rowsText()), kJourney);
-      QVERIFY(open(QStringLiteral("0")));
-      QTRY_VERIFY2_WITH_TIMEOUT(decoded() && test::rowWithKey(top(), QStringLiteral("SIR")) >= 0,
-                                qPrintable(rowsText()), 10000);
+      QVERIFY(screens.openSection(QStringLiteral("Channel Quality"), QStringLiteral("CCTRCH SIR")));
+      QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() >= 1, qPrintable(screens.rowsText()), kJourney);
+      QVERIFY(screens.open(QStringLiteral("0")));
+      QTRY_VERIFY2_WITH_TIMEOUT(screens.decoded() && test::rowWithKey(top(), QStringLiteral("SIR")) >= 0,
+                                qPrintable(screens.rowsText()), 10000);
       QVERIFY(keep(window, QStringLiteral("utran-cctrch-sir")));
-      QVERIFY(open(QStringLiteral("SIR")));
-      QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() == 6 && decoded(), qPrintable(rowsText()), 10000);
+      QVERIFY(screens.open(QStringLiteral("SIR")));
+      QTRY_VERIFY2_WITH_TIMEOUT(top()->tableView()->numberOfRows() == 6 && screens.decoded(), qPrintable(screens.rowsText()), 10000);
       QVERIFY(keep(window, QStringLiteral("utran-cctrch-sir-values")));
     }
   }
