@@ -20,6 +20,7 @@
 #include "app/Preferences.h"
 #include "app/ScreenHost.h"
 #include "model/CorvaneModel.h"
+#include "presenter/StatusLine.h"
 
 namespace corvane {
 
@@ -32,16 +33,6 @@ struct CorvaneAppEnvironment {
   std::filesystem::path deviceRoot;  // under which the phone's absolute paths are found
 };
 
-// Formats dates in local time with a fixed pattern (Qt's date-format syntax).
-class DateFormatter {
- public:
-  explicit DateFormatter(QString pattern) : pattern_(std::move(pattern)) {}
-  QString stringFromDate(const Date& date) const;
-
- private:
-  QString pattern_;
-};
-
 class CorvaneApp final : public QObject,
                          public CorvaneModelDelegate,
                          public NavigationControllerDelegate,
@@ -49,8 +40,6 @@ class CorvaneApp final : public QObject,
   Q_OBJECT
 
  public:
-  static constexpr const char* kUpdatePattern = "'Updated' yyyy-MM-dd 'at' HH:mm:ss";
-
   explicit CorvaneApp(CorvaneAppEnvironment environment);
   // Terminates first when the application was launched and not yet terminated.
   ~CorvaneApp() override;
@@ -70,8 +59,8 @@ class CorvaneApp final : public QObject,
   QWidget* window() const { return _window.get(); }
   CorvaneSaveViewController* saveViewController() const { return _saveViewController; }
   bool allowSaveButton() const override { return _allowSaveButton; }
-  const QString& updateMessage() const { return _updateMessage; }
-  void setUpdateMessage(const QString& message) { _updateMessage = message; }
+  QString updateMessage() const { return QString::fromStdString(_statusLine.updateMessage()); }
+  void setUpdateMessage(const QString& message) { _statusLine.setUpdateMessage(message.toStdString()); }
 
   NavigationController* navigationController() const { return _navController; }
   CorvaneModel* model() const { return _model.get(); }
@@ -84,8 +73,7 @@ class CorvaneApp final : public QObject,
   std::unique_ptr<CorvaneModel> _model;
   bool _unsetRSSI = false;
   bool _allowSaveButton = false;
-  std::unique_ptr<DateFormatter> _dateFormatter;
-  QString _updateMessage;
+  StatusLine _statusLine;
 
   CorvaneAppEnvironment environment_;
   bool running_ = false;

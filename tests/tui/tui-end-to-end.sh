@@ -1,0 +1,169 @@
+#!/usr/bin/env bash
+# tui-end-to-end.sh TUI TELEPHONYD DECODE: drives corvane-tui in a tmux pane
+# (send-keys, capture-pane) against corvane-telephonyd and its LTE simulator:
+# the root lists the sections, a section shows its rows, back keeps the
+# selection, a saved snapshot reads back, a resize to 60x20 and back keeps
+# working, the service going away shows "Connecting..." and its return the
+# tree again; then the same screens on a plain ASCII terminal without colour.
+set -u
+tui=$1
+service=$2
+decode=$3
+
+work=$(mktemp -d /tmp/corvane-tui-e2e.XXXXXX)
+runtime="$work/run"
+device="$work/device"
+socket="corvane-tui-e2e-$$"
+mkdir -m 700 "$runtime"
+mkdir -p "$device/OstrelInternal/Library/PreferenceBundles/Carrier Settings.bundle" "$device/var/log/corvane/snapshots"
+service_pid=""
+
+cleanup() {
+  tmux -L "$socket" kill-server 2>/dev/null
+  [ -n "$service_pid" ] && kill "$service_pid" 2>/dev/null && wait "$service_pid" 2>/dev/null
+  rm -rf "$work"
+}
+trap cleanup EXIT
+
+fail() {
+  echo "FAIL: $*" >&2
+  echo "--- the screen:" >&2
+  screen >&2
+  exit 1
+}
+
+start_service() {
+  CORVANE_RUNTIME_DIR="$runtime" "$service" --technology Quendra_LTE --seed 3 --rate 10 >>"$work/service.log" 2>&1 &
+  service_pid=$!
+}
+
+screen() { tmux -L "$socket" capture-pane -p -t e2e; }
+line() { screen | sed -n "$(($1 + 1))p"; }
+last_lines() { screen | tail -n "$1"; }
+
+# Waits until the screen holds the text (a fixed string), up to $2 seconds (default 10).
+wait_for() {
+  local text=$1 limit=${2:-10} waited=0
+  until screen | grep -qF -- "$text"; do
+    sleep 0.2
+    waited=$((waited + 1))
+    [ "$waited" -ge $((limit * 5)) ] && fail "\"$text\" did not show within ${limit} s"
+  done
+}
+
+# Waits until line $1 (0 is the top) holds the text.
+wait_for_line() {
+  local number=$1 text=$2 waited=0
+  until line "$number" | grep -qF -- "$text"; do
+    sleep 0.2
+    waited=$((waited + 1))
+    [ "$waited" -ge 50 ] && fail "line $number does not show \"$text\""
+  done
+}
+
+keys() { tmux -L "$socket" send-keys -t e2e "$@"; }
+
+start_tui() {
+  # $1: the environment for the program (locale, colour)
+  tmux -L "$socket" -u -f /dev/null new-session -d -s e2e -x 80 -y 24 \
+    "env $1 CORVANE_RUNTIME_DIR='$runtime' CORVANE_DEVICE_ROOT='$device' '$tui'; sleep 30"
+}
+
+start_service
+start_tui "LANG=C.UTF-8 LC_ALL=C.UTF-8 TERM=screen-256color"
+
+# The root screen lists the sections once the first display update has come.
+wait_for "Updated " 20
+for section in "Serving Cell" "Neighbours" "Reselection" "SIM Info" "PDP Context Info"; do
+  screen | grep -q "^ $section  *›\$" || fail "the root does not list \"$section\" as a section"
+done
+line 0 | grep -q "Corvane" || fail "the title is not Corvane"
+last_lines 1 | grep -q "/ filter  s save  ? keys  q quit" || fail "the status line has no key hints"
+
+# Drilling in: Serving Cell, then its measurements, which show their rows.
+keys Enter
+wait_for_line 0 "Serving Cell"
+line 0 | grep -q "‹ Corvane" || fail "the title line has no way back to Corvane"
+keys Down Enter
+wait_for_line 0 "Serving Cell Measurements"
+wait_for "Measured RSRP"
+screen | grep -Eq "^ Measured RSRP  +-?[0-9]+\.[0-9]{2} dBm\$" || fail "the RSRP row has no right-aligned value"
+wait_for_line 22 "Version: "
+
+# Back returns to the same selection.
+keys Left
+wait_for_line 0 "Serving Cell"
+wait_for_line 22 "Serving Cell Measurements"
+keys BSpace
+wait_for_line 22 "Serving Cell"
+line 0 | grep -q "‹" && fail "the root shows a way back"
+
+# The filter keeps the rows that match.
+keys Down Down Down "/" "S" "I" "M" Enter
+wait_for "Filter: SIM"
+screen | grep -q "^ SIM Info" || fail "the filter hides the matching row"
+screen | grep -q "^ Neighbours" && fail "the filter shows a row that does not match"
+keys Escape
+wait_for_line 2 "Neighbours"
+
+# The keys are shown by ?, and any key closes them.
+keys "?"
+wait_for "Any key closes this help."
+keys x
+wait_for "Updated "
+
+# A save writes a snapshot that reads back.
+keys s
+wait_for "Save Snapshot"
+wait_for "Contents (every entry is saved):"
+keys -l "rig 7 roof"
+keys Enter
+wait_for "Saved CorvaneSnapshot-"
+snapshot=$(ls "$device"/var/log/corvane/snapshots/CorvaneSnapshot-*.corvane 2>/dev/null | head -n 1)
+[ -n "$snapshot" ] || fail "no snapshot file was written"
+grep -q "<string>rig 7 roof</string>" "$snapshot" || fail "the snapshot lacks its description"
+"$decode" --technology Quendra_LTE --quiet "$snapshot" >"$work/decoded.txt" 2>&1 || fail "the snapshot does not read back: $(cat "$work/decoded.txt")"
+grep -q "Measured RSRP" "$work/decoded.txt" || fail "the snapshot read back holds no serving-cell measurement"
+
+# A resize to 60x20 and back keeps working.
+keys Home
+wait_for_line 22 "Serving Cell"
+tmux -L "$socket" resize-window -t e2e -x 60 -y 20
+sleep 0.5
+[ "$(screen | wc -l)" -eq 20 ] || fail "the pane is not 20 lines high"
+wait_for_line 19 "Updated "
+# The section's mark follows the right edge: column 58 of 60.
+line 1 | grep -Eq "^ Serving Cell {45}›\$" || fail "at 60x20 the first row does not reach the right edge"
+keys Enter
+wait_for_line 0 "Serving Cell"
+keys Left
+tmux -L "$socket" resize-window -t e2e -x 80 -y 24
+sleep 0.5
+wait_for_line 23 "Updated "
+wait_for_line 22 "Serving Cell"
+line 1 | grep -Eq "^ Serving Cell {65}›\$" || fail "after the resize back the first row does not reach the right edge"
+
+# The service killed and restarted: "Connecting..." and then the tree again.
+kill "$service_pid"
+wait "$service_pid" 2>/dev/null
+service_pid=""
+wait_for "Connecting..." 15
+start_service
+wait_for "Updated " 30
+screen | grep -q "^ Serving Cell  *›\$" || fail "the tree did not come back"
+
+# q quits.
+keys q
+sleep 1
+screen | grep -q "Updated " && fail "q did not quit"
+tmux -L "$socket" kill-server 2>/dev/null
+
+# A plain ASCII terminal without colour.
+start_tui "LANG=C LC_ALL=C NO_COLOR=1 TERM=screen"
+wait_for "Updated " 20
+screen | grep -q "^ Serving Cell  *>\$" || fail "on an ASCII terminal the sections are not marked with >"
+keys Enter
+wait_for_line 0 "< Corvane"
+tmux -L "$socket" capture-pane -e -p -t e2e | grep -q $'\e\\[3[0-7]m' && fail "colour although NO_COLOR is set"
+keys q
+echo "corvane-tui end to end: all passed"
