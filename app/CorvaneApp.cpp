@@ -37,7 +37,9 @@ QIcon applicationIcon() { return QIcon(QStringLiteral(":/corvane/corvane.svg"));
 
 }  // namespace
 
-CorvaneApp::CorvaneApp(CorvaneAppEnvironment environment) : environment_(std::move(environment)) {}
+CorvaneApp::CorvaneApp(CorvaneAppEnvironment environment)
+    : preferenceStore_(environment.preferences), signalStrength_(preferenceStore_),
+      environment_(std::move(environment)) {}
 
 CorvaneApp::~CorvaneApp() {
   if (running_) applicationWillTerminate();
@@ -47,29 +49,13 @@ std::filesystem::path CorvaneApp::snapshotDirectory() const {
   return devicePath(kSnapshotDirectoryPath, environment_.deviceRoot);
 }
 
-void CorvaneApp::_setGSMRSSI(bool value) {
-  const QString domain = QString::fromLatin1(kHomeScreenPreferencesDomain);
-  const QString key = QString::fromLatin1(kShowGSMRSSIKey);
-  environment_.preferences.setAppValue(key, value, domain);
-  environment_.preferences.synchronize(domain);
-  environment_.preferences.SendAppPreferencesChanged(domain, key);
-}
+void CorvaneApp::_setGSMRSSI(bool value) { signalStrength_.setGSMRSSI(value); }
 
 void CorvaneApp::getSaveButtonPref() {
   _allowSaveButton = saveOffered(environment_.deviceRoot);
 }
 
-void CorvaneApp::getRSSIPref() {
-  // Read from this application's domain, written to the home screen's: unless
-  // this application's own domain says true, the numeric display goes on at
-  // every launch.
-  const bool shown = environment_.preferences.getAppBooleanValue(QString::fromLatin1(kShowGSMRSSIKey),
-                                                                 QString::fromLatin1(kAppPreferencesDomain));
-  if (!shown) {
-    _unsetRSSI = true;
-    _setGSMRSSI(true);
-  }
-}
+void CorvaneApp::getRSSIPref() { signalStrength_.applicationDidFinishLaunching(); }
 
 void CorvaneApp::applicationDidFinishLaunching() {
   if (running_) return;
@@ -114,7 +100,7 @@ void CorvaneApp::applicationDidFinishLaunching() {
 void CorvaneApp::applicationWillTerminate() {
   if (!running_) return;
   running_ = false;
-  if (_unsetRSSI) _setGSMRSSI(false);
+  signalStrength_.applicationWillTerminate();
 
   _statusLine.setUpdateMessage({});
   _saveViewController = nullptr;

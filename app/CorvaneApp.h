@@ -24,9 +24,6 @@
 
 namespace corvane {
 
-// The key of the preference that asks the status bar for the signal strength as a number.
-inline constexpr const char* kShowGSMRSSIKey = "ZLShowGSMRSSI";
-
 struct CorvaneAppEnvironment {
   CorvaneModelEnvironment model;  // its run loop is the main queue of the screens too
   Preferences& preferences;
@@ -71,7 +68,8 @@ class CorvaneApp final : public QObject,
   NavigationController* _navController = nullptr;  // owned by the window
   QPointer<CorvaneSaveViewController> _saveViewController;
   std::unique_ptr<CorvaneModel> _model;
-  bool _unsetRSSI = false;
+  PreferencesStore preferenceStore_;
+  SignalStrengthPreference signalStrength_;
   bool _allowSaveButton = false;
   StatusLine _statusLine;
 

@@ -87,14 +87,17 @@ void eraseLastCharacter(std::string& text) {
 
 }  // namespace
 
-TerminalApp::TerminalApp(CorvaneModelEnvironment environment, TerminalOptions options, std::function<void()> quit)
-    : environment_(std::move(environment)), options_(std::move(options)), quit_(std::move(quit)) {}
+TerminalApp::TerminalApp(CorvaneModelEnvironment environment, TerminalOptions options, PreferenceStore& preferences,
+                         std::function<void()> quit)
+    : environment_(std::move(environment)), options_(std::move(options)), quit_(std::move(quit)),
+      signalStrength_(preferences) {}
 
 TerminalApp::~TerminalApp() { stop(); }
 
 void TerminalApp::start() {
   if (started_) return;
   started_ = true;
+  signalStrength_.applicationDidFinishLaunching();
   initscr();
   cbreak();
   noecho();
@@ -135,6 +138,7 @@ void TerminalApp::stop() {
   environment_.runLoop.cancel(ticker_);
   model_.reset();
   endwin();
+  signalStrength_.applicationWillTerminate();
 }
 
 void TerminalApp::updateViewControllerFromModel() {

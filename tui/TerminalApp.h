@@ -18,6 +18,7 @@
 #include "model/CorvaneModel.h"
 #include "presenter/PaneRows.h"
 #include "presenter/ScreenStack.h"
+#include "presenter/SignalStrengthPreference.h"
 #include "presenter/SnapshotSaver.h"
 #include "presenter/StatusLine.h"
 
@@ -31,15 +32,17 @@ struct TerminalOptions {
 
 class TerminalApp final : public CorvaneModelDelegate {
  public:
-  // `quit` ends the program's event loop.
-  TerminalApp(CorvaneModelEnvironment environment, TerminalOptions options, std::function<void()> quit);
+  // `quit` ends the program's event loop; `preferences` must outlive this object.
+  TerminalApp(CorvaneModelEnvironment environment, TerminalOptions options, PreferenceStore& preferences,
+              std::function<void()> quit);
   ~TerminalApp() override;
   TerminalApp(const TerminalApp&) = delete;
   TerminalApp& operator=(const TerminalApp&) = delete;
 
-  // Takes the terminal over and starts the model.
+  // Takes the terminal over, turns the status bar's numeric signal strength
+  // on and starts the model.
   void start();
-  // Gives the terminal back.
+  // Gives the terminal back and the preference too.
   void stop();
 
   void updateViewControllerFromModel() override;
@@ -82,6 +85,7 @@ class TerminalApp final : public CorvaneModelDelegate {
   std::unique_ptr<CorvaneModel> model_;
   ScreenStack stack_;
   StatusLine statusLine_;
+  SignalStrengthPreference signalStrength_;
   bool updated_ = false;  // a display update has come
   bool started_ = false;
 

@@ -17,6 +17,7 @@
 #include <string>
 
 #include "LogGenerator/logcode/ClassIndex.h"
+#include "app/Preferences.h"
 #include "model/SocketModelEnvironment.h"
 #include "platform/Assertion.h"
 #include "platform/CommandLine.h"
@@ -58,7 +59,8 @@ const corvane::ProgramUsage kProgram{
     "\n"
     "The runtime directory is $CORVANE_RUNTIME_DIR, else $XDG_RUNTIME_DIR/corvane,\n"
     "else /tmp/corvane-$UID; the phone's paths are found below $CORVANE_DEVICE_ROOT,\n"
-    "else /, and snapshots go to var/log/corvane/snapshots below it.\n",
+    "else /, and snapshots go to var/log/corvane/snapshots below it. While it runs,\n"
+    "ZLShowGSMRSSI is true for the home screen, as corvane sets it.\n",
 };
 
 }  // namespace
@@ -113,7 +115,9 @@ int main(int argc, char** argv) {
   platform->ports().interruptWaitsWhenReadable(signalEvents->pendingDescriptor());
 
   {
-    tui::TerminalApp app(platform->environment(), options, [] { QCoreApplication::quit(); });
+    Preferences preferences;
+    PreferencesStore store(preferences);
+    tui::TerminalApp app(platform->environment(), options, store, [] { QCoreApplication::quit(); });
     app.start();
     application.exec();
     app.stop();

@@ -1,20 +1,25 @@
 #!/usr/bin/env bash
-# tui-end-to-end.sh TUI TELEPHONYD DECODE: drives corvane-tui in a tmux pane
+# tui-end-to-end.sh TUI TELEPHONYD DECODE DEMO: drives corvane-tui in a tmux pane
 # (send-keys, capture-pane) against corvane-telephonyd and its LTE simulator:
 # the root lists the sections, a section shows its rows, back keeps the
 # selection, a saved snapshot reads back, a resize to 60x20 and back keeps
 # working, the service going away shows "Connecting..." and its return the
-# tree again; then the same screens on a plain ASCII terminal without colour.
+# tree again, and the home screen's numeric signal strength is on while it
+# runs; then the same screens on a plain ASCII terminal without colour, and
+# corvane-demo --tui.
 set -u
 tui=$1
 service=$2
 decode=$3
+demo=$4
 
 work=$(mktemp -d /tmp/corvane-tui-e2e.XXXXXX)
 runtime="$work/run"
 device="$work/device"
 socket="corvane-tui-e2e-$$"
 mkdir -m 700 "$runtime"
+export XDG_CONFIG_HOME="$work/config" DBUS_SESSION_BUS_ADDRESS="unix:path=$work/no-bus"
+home_screen="$XDG_CONFIG_HOME/corvane/org.corvane.HomeScreen.conf"
 mkdir -p "$device/OstrelInternal/Library/PreferenceBundles/Carrier Settings.bundle" "$device/var/log/corvane/snapshots"
 service_pid=""
 
@@ -66,7 +71,8 @@ keys() { tmux -L "$socket" send-keys -t e2e "$@"; }
 start_tui() {
   # $1: the environment for the program (locale, colour)
   tmux -L "$socket" -u -f /dev/null new-session -d -s e2e -x 80 -y 24 \
-    "env $1 CORVANE_RUNTIME_DIR='$runtime' CORVANE_DEVICE_ROOT='$device' '$tui'; sleep 30"
+    "env $1 XDG_CONFIG_HOME='$XDG_CONFIG_HOME' DBUS_SESSION_BUS_ADDRESS='$DBUS_SESSION_BUS_ADDRESS' \
+       CORVANE_RUNTIME_DIR='$runtime' CORVANE_DEVICE_ROOT='$device' ${2:-'$tui'}; sleep 30"
 }
 
 start_service
@@ -79,6 +85,7 @@ for section in "Serving Cell" "Neighbours" "Reselection" "SIM Info" "PDP Context
 done
 line 0 | grep -q "Corvane" || fail "the title is not Corvane"
 last_lines 1 | grep -q "/ filter  s save  ? keys  q quit" || fail "the status line has no key hints"
+grep -q "ZLShowGSMRSSI=true" "$home_screen" || fail "the home screen's numeric signal strength is not on"
 
 # Drilling in: Serving Cell, then its measurements, which show their rows.
 keys Enter
@@ -152,10 +159,11 @@ start_service
 wait_for "Updated " 30
 screen | grep -q "^ Serving Cell  *›\$" || fail "the tree did not come back"
 
-# q quits.
+# q quits, and the preference goes back.
 keys q
 sleep 1
 screen | grep -q "Updated " && fail "q did not quit"
+grep -q "ZLShowGSMRSSI=false" "$home_screen" || fail "the home screen's numeric signal strength is still on"
 tmux -L "$socket" kill-server 2>/dev/null
 
 # A plain ASCII terminal without colour.
@@ -166,4 +174,18 @@ keys Enter
 wait_for_line 0 "< Corvane"
 tmux -L "$socket" capture-pane -e -p -t e2e | grep -q $'\e\\[3[0-7]m' && fail "colour although NO_COLOR is set"
 keys q
+sleep 1
+tmux -L "$socket" kill-server 2>/dev/null
+kill "$service_pid" 2>/dev/null
+wait "$service_pid" 2>/dev/null
+service_pid=""
+
+# The demo in the terminal: its own service and device root, and the same screens.
+start_tui "-u DISPLAY -u WAYLAND_DISPLAY LANG=C.UTF-8 LC_ALL=C.UTF-8 TERM=screen-256color" \
+  "'$demo' --tui --technology Quendra_LTE --device-root '$work/demo-device'"
+wait_for "Updated " 20
+screen | grep -q "^ Serving Cell  *›\$" || fail "the demo in the terminal does not list the sections"
+keys q
+wait_for "corvane-demo: snapshots are saved in"
+[ -d "$work/demo-device/var/log/corvane/snapshots" ] || fail "the demo made no snapshot directory in its device root"
 echo "corvane-tui end to end: all passed"
