@@ -472,8 +472,15 @@ void TerminalApp::drawStatus(int y, int width) {
   if (connecting) attron(COLOR_PAIR(kConnectingPair));
   put(y, 3, fit(text, width - 4, L""));
   if (connecting) attroff(COLOR_PAIR(kConnectingPair));
-  const int hintsAt = width - columns(hints) - 1;
-  if (hintsAt > 3 + columns(text) + 2) put(y, hintsAt, hints);
+  // All the hints where they fit, else only the one that leads to the others.
+  const int textEnd = 3 + columns(text) + 2;
+  for (const std::wstring& shown : {hints, std::wstring(L"? keys")}) {
+    const int at = width - columns(shown) - 1;
+    if (at > textEnd) {
+      put(y, at, shown);
+      break;
+    }
+  }
   attroff(A_REVERSE);
 }
 

@@ -68,6 +68,14 @@ wait_for_line() {
 
 keys() { tmux -L "$socket" send-keys -t e2e "$@"; }
 
+# With CORVANE_UPDATE_SCREENSHOTS set, the screen is kept as docs/tui/NAME.txt.
+captures="$(cd "$(dirname "$0")/../.." && pwd)/docs/tui"
+capture() {
+  [ -n "${CORVANE_UPDATE_SCREENSHOTS:-}" ] || return 0
+  mkdir -p "$captures"
+  screen >"$captures/$1.txt"
+}
+
 start_tui() {
   # $1: the environment for the program (locale, colour)
   tmux -L "$socket" -u -f /dev/null new-session -d -s e2e -x 80 -y 24 \
@@ -86,6 +94,7 @@ done
 line 0 | grep -q "Corvane" || fail "the title is not Corvane"
 last_lines 1 | grep -q "/ filter  s save  ? keys  q quit" || fail "the status line has no key hints"
 grep -q "ZLShowGSMRSSI=true" "$home_screen" || fail "the home screen's numeric signal strength is not on"
+capture root
 
 # Drilling in: Serving Cell, then its measurements, which show their rows.
 keys Enter
@@ -96,6 +105,7 @@ wait_for_line 0 "Serving Cell Measurements"
 wait_for "Measured RSRP"
 screen | grep -Eq "^ Measured RSRP  +-?[0-9]+\.[0-9]{2} dBm\$" || fail "the RSRP row has no right-aligned value"
 wait_for_line 22 "Version: "
+capture serving-cell-measurements
 
 # Back returns to the same selection.
 keys Left
@@ -109,6 +119,7 @@ line 0 | grep -q "‹" && fail "the root shows a way back"
 keys Down Down Down "/" "S" "I" "M" Enter
 wait_for "Filter: SIM"
 screen | grep -q "^ SIM Info" || fail "the filter hides the matching row"
+capture filter
 screen | grep -q "^ Neighbours" && fail "the filter shows a row that does not match"
 keys Escape
 wait_for_line 2 "Neighbours"
@@ -116,6 +127,7 @@ wait_for_line 2 "Neighbours"
 # The keys are shown by ?, and any key closes them.
 keys "?"
 wait_for "Any key closes this help."
+capture keys
 keys x
 wait_for "Updated "
 
@@ -124,6 +136,8 @@ keys s
 wait_for "Save Snapshot"
 wait_for "Contents (every entry is saved):"
 keys -l "rig 7 roof"
+wait_for "rig 7 roof_"
+capture save
 keys Enter
 wait_for "Saved CorvaneSnapshot-"
 snapshot=$(ls "$device"/var/log/corvane/snapshots/CorvaneSnapshot-*.corvane 2>/dev/null | head -n 1)
@@ -141,6 +155,7 @@ sleep 0.5
 wait_for_line 19 "Updated "
 # The section's mark follows the right edge: column 58 of 60.
 line 1 | grep -Eq "^ Serving Cell {45}›\$" || fail "at 60x20 the first row does not reach the right edge"
+capture root-60x20
 keys Enter
 wait_for_line 0 "Serving Cell"
 keys Left
@@ -155,6 +170,7 @@ kill "$service_pid"
 wait "$service_pid" 2>/dev/null
 service_pid=""
 wait_for "Connecting..." 15
+capture connecting
 start_service
 wait_for "Updated " 30
 screen | grep -q "^ Serving Cell  *›\$" || fail "the tree did not come back"
@@ -172,6 +188,7 @@ wait_for "Updated " 20
 screen | grep -q "^ Serving Cell  *>\$" || fail "on an ASCII terminal the sections are not marked with >"
 keys Enter
 wait_for_line 0 "< Corvane"
+capture serving-cell-ascii
 tmux -L "$socket" capture-pane -e -p -t e2e | grep -q $'\e\\[3[0-7]m' && fail "colour although NO_COLOR is set"
 keys q
 sleep 1
