@@ -383,6 +383,11 @@ void TerminalApp::drawTitle(int width) {
   attron(A_BOLD);
   put(0, std::max(centred, backWidth + 3), shownTitle);
   attroff(A_BOLD);
+  // A filter in force shows at the right end, over the title if need be.
+  if (mode_ != Mode::Filter && !filter_.empty()) {
+    const std::wstring shownFilter = fit(L"/" + widen(filter_), width / 3, options_.unicode ? L"…" : L"~");
+    put(0, width - 1 - columns(shownFilter), shownFilter);
+  }
   attroff(A_REVERSE);
 }
 
@@ -439,8 +444,8 @@ void TerminalApp::drawDetail(int y, int width) {
   std::wstring text;
   if (!message_.empty()) {
     text = widen(message_);
-  } else if (mode_ == Mode::Filter || !filter_.empty()) {
-    text = widen("Filter: " + filter_) + (mode_ == Mode::Filter ? L"_" : L"");
+  } else if (mode_ == Mode::Filter) {
+    text = widen("Filter: " + filter_) + L"_";
   } else {
     const NodeRef* child = paneChildAt(stack_.top().node.get(), stack_.top().selectedRow);
     if (child && *child) {

@@ -16,7 +16,8 @@ demo=$4
 work=$(mktemp -d /tmp/corvane-tui-e2e.XXXXXX)
 runtime="$work/run"
 device="$work/device"
-socket="corvane-tui-e2e-$$"
+sessions=0
+socket=""
 mkdir -m 700 "$runtime"
 export XDG_CONFIG_HOME="$work/config" DBUS_SESSION_BUS_ADDRESS="unix:path=$work/no-bus"
 home_screen="$XDG_CONFIG_HOME/corvane/org.corvane.HomeScreen.conf"
@@ -24,7 +25,8 @@ mkdir -p "$device/OstrelInternal/Library/PreferenceBundles/Carrier Settings.bund
 service_pid=""
 
 cleanup() {
-  tmux -L "$socket" kill-server 2>/dev/null
+  local n
+  for n in $(seq 1 "$sessions"); do tmux -L "corvane-tui-e2e-$$-$n" kill-server 2>/dev/null; done
   [ -n "$service_pid" ] && kill "$service_pid" 2>/dev/null && wait "$service_pid" 2>/dev/null
   rm -rf "$work"
 }
@@ -77,7 +79,10 @@ capture() {
 }
 
 start_tui() {
-  # $1: the environment for the program (locale, colour)
+  # $1: the environment for the program (locale, colour); $2: the program, when not corvane-tui.
+  # Each run has a tmux server of its own: one that is still going away cannot be met.
+  sessions=$((sessions + 1))
+  socket="corvane-tui-e2e-$$-$sessions"
   tmux -L "$socket" -u -f /dev/null new-session -d -s e2e -x 80 -y 24 \
     "env $1 XDG_CONFIG_HOME='$XDG_CONFIG_HOME' DBUS_SESSION_BUS_ADDRESS='$DBUS_SESSION_BUS_ADDRESS' \
        CORVANE_RUNTIME_DIR='$runtime' CORVANE_DEVICE_ROOT='$device' ${2:-'$tui'}; sleep 30"
@@ -116,13 +121,35 @@ wait_for_line 22 "Serving Cell"
 line 0 | grep -q "‹" && fail "the root shows a way back"
 
 # The filter keeps the rows that match.
-keys Down Down Down "/" "S" "I" "M" Enter
-wait_for "Filter: SIM"
+keys Down Down Down "/" "S" "I" "M"
+wait_for_line 22 "Filter: SIM_"
+keys Enter
+wait_for_line 0 "/SIM"
+wait_for_line 22 "SIM Info"
 screen | grep -q "^ SIM Info" || fail "the filter hides the matching row"
 capture filter
 screen | grep -q "^ Neighbours" && fail "the filter shows a row that does not match"
 keys Escape
 wait_for_line 2 "Neighbours"
+line 0 | grep -q "/SIM" && fail "Esc did not drop the filter from the title line"
+
+# A value too long for its row is cut short there and read whole on the
+# detail line, which scrolls sideways (at 25 columns the 19-digit ICCID does
+# not fit either).
+tmux -L "$socket" resize-window -t e2e -x 25 -y 20
+keys Home Down Down Down Enter
+wait_for_line 0 "SIM Info"
+keys "/" "I" "C" "C" "I" "D" Enter
+wait_for_line 18 "EF-ICCID: 8900"
+line 1 | grep -q "^ EF-ICCID .*…\$" || fail "the ICCID row at 25 columns is not cut short"
+line 18 | grep -q "8594606\$" && fail "the detail line shows the end before scrolling"
+keys "]"
+wait_for_line 18 "8900101233198594606"
+line 18 | grep -q "^ EF-ICCID" && fail "] did not scroll the detail line"
+keys Escape Left
+tmux -L "$socket" resize-window -t e2e -x 80 -y 24
+wait_for_line 0 "Corvane"
+wait_for_line 22 "SIM Info"
 
 # The keys are shown by ?, and any key closes them.
 keys "?"
