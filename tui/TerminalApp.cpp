@@ -1,6 +1,7 @@
 #include "tui/TerminalApp.h"
 
 #include <ncurses.h>
+#include <poll.h>
 
 #include <algorithm>
 #include <array>
@@ -122,7 +123,9 @@ void TerminalApp::start() {
     filter_.clear();
   });
   model_ = std::make_unique<CorvaneModel>(environment_, this);
-  inputWatch_ = environment_.runLoop.watchReadable(0, [this] { onInput(); });
+  inputWatch_ = environment_.runLoop.watchReadable(0, [this] {
+    if (!onInput() && terminalHungUp()) quit_();
+  });
   // Resizes come as keys too, and the spinner turns: both on a short tick.
   ticker_ = environment_.runLoop.scheduleRepeatingTimer(kTickInterval, [this] { tick(); });
   environment_.runLoop.dispatchAsync([this] {
@@ -155,16 +158,24 @@ StatusState TerminalApp::status() const {
   return statusLine_.current(connected);
 }
 
-void TerminalApp::onInput() {
+bool TerminalApp::onInput() {
   wint_t key = 0;
   int result = 0;
   bool any = false;
   while ((result = get_wch(&key)) != ERR) {
     any = true;
     handleKey(result, key);
-    if (!started_) return;
+    if (!started_) return true;
   }
   if (any) draw();
+  return any;
+}
+
+bool TerminalApp::terminalHungUp() {
+  // A terminal that has gone (the SSH connection dropped) stays readable for
+  // ever without giving a key.
+  pollfd input{0, POLLIN, 0};
+  return ::poll(&input, 1, 0) > 0 && (input.revents & (POLLHUP | POLLERR | POLLNVAL)) != 0;
 }
 
 void TerminalApp::tick() {

@@ -50,7 +50,9 @@ class TerminalApp final : public CorvaneModelDelegate {
  private:
   enum class Mode { Browse, Filter, Help, Save, Alert };
 
-  void onInput();
+  // Handles the keys that are waiting; false when there was none.
+  bool onInput();
+  static bool terminalHungUp();
   void tick();
   void handleKey(int result, wint_t key);
   void handleBrowseKey(int result, wint_t key);

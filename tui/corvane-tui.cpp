@@ -15,6 +15,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <vector>
 
 #include "LogGenerator/logcode/ClassIndex.h"
 #include "app/Preferences.h"
@@ -106,8 +107,11 @@ int main(int argc, char** argv) {
   // would write over the screen.
   log::setSink(log::makeSystemLogSink());
   ClassIndex::setTeardownStream(nullptr);
+  // A hang-up (the SSH connection dropped) ends it as cleanly as SIGINT and SIGTERM.
+  std::vector<int> endingSignals = SignalEvents::terminationSignals();
+  endingSignals.push_back(SIGHUP);
   const std::unique_ptr<SignalEvents> signalEvents = SignalEvents::watch(
-      platform->runLoop(), SignalEvents::terminationSignals(), [](int) { QCoreApplication::quit(); }, error);
+      platform->runLoop(), endingSignals, [](int) { QCoreApplication::quit(); }, error);
   if (!signalEvents) {
     std::fprintf(stderr, "corvane-tui: %s\n", error.c_str());
     return kExitFailure;

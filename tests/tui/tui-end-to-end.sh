@@ -217,9 +217,15 @@ keys Enter
 wait_for_line 0 "< Corvane"
 capture serving-cell-ascii
 tmux -L "$socket" capture-pane -e -p -t e2e | grep -q $'\e\\[3[0-7]m' && fail "colour although NO_COLOR is set"
-keys q
-sleep 1
+# The terminal hung up (as when an SSH connection drops): it ends cleanly, the preference set back.
+grep -q "ZLShowGSMRSSI=true" "$home_screen" || fail "the numeric signal strength is not on in the second run"
 tmux -L "$socket" kill-server 2>/dev/null
+waited=0
+until grep -q "ZLShowGSMRSSI=false" "$home_screen"; do
+  sleep 0.2
+  waited=$((waited + 1))
+  [ "$waited" -ge 25 ] && fail "a hang-up left the numeric signal strength on"
+done
 kill "$service_pid" 2>/dev/null
 wait "$service_pid" 2>/dev/null
 service_pid=""
