@@ -1,23 +1,19 @@
 #include "app/CorvaneApp.h"
 
-#include <QDateTime>
 #include <QGuiApplication>
 #include <QIcon>
 #include <QScreen>
 #include <QVBoxLayout>
 
-#include <system_error>
-
 #include "app/Theme.h"
 #include "platform/DateText.h"
 #include "platform/DevicePaths.h"
+#include "presenter/ScreenStack.h"
+#include "presenter/SnapshotSaver.h"
 
 namespace corvane {
 
 namespace {
-
-const QString kConnecting = QStringLiteral("Connecting");
-const QString kConnectingWithDots = QStringLiteral("Connecting...");
 
 // A phone-like window on a desktop; the whole screen on a screen that small.
 constexpr int kDesktopWidth = 400;
@@ -41,11 +37,9 @@ QIcon applicationIcon() { return QIcon(QStringLiteral(":/corvane/corvane.svg"));
 
 }  // namespace
 
-QString DateFormatter::stringFromDate(const Date& date) const {
-  return QDateTime::fromMSecsSinceEpoch(date.microsecondsSince1970 / 1000, Qt::LocalTime).toString(pattern_);
-}
-
-CorvaneApp::CorvaneApp(CorvaneAppEnvironment environment) : environment_(std::move(environment)) {}
+CorvaneApp::CorvaneApp(CorvaneAppEnvironment environment)
+    : preferenceStore_(environment.preferences), signalStrength_(preferenceStore_),
+      environment_(std::move(environment)) {}
 
 CorvaneApp::~CorvaneApp() {
   if (running_) applicationWillTerminate();
@@ -55,30 +49,13 @@ std::filesystem::path CorvaneApp::snapshotDirectory() const {
   return devicePath(kSnapshotDirectoryPath, environment_.deviceRoot);
 }
 
-void CorvaneApp::_setGSMRSSI(bool value) {
-  const QString domain = QString::fromLatin1(kHomeScreenPreferencesDomain);
-  const QString key = QString::fromLatin1(kShowGSMRSSIKey);
-  environment_.preferences.setAppValue(key, value, domain);
-  environment_.preferences.synchronize(domain);
-  environment_.preferences.SendAppPreferencesChanged(domain, key);
-}
+void CorvaneApp::_setGSMRSSI(bool value) { signalStrength_.setGSMRSSI(value); }
 
 void CorvaneApp::getSaveButtonPref() {
-  std::error_code error;
-  _allowSaveButton = std::filesystem::exists(devicePath(kSaveEnablingMarkerPath, environment_.deviceRoot), error);
+  _allowSaveButton = saveOffered(environment_.deviceRoot);
 }
 
-void CorvaneApp::getRSSIPref() {
-  // Read from this application's domain, written to the home screen's: unless
-  // this application's own domain says true, the numeric display goes on at
-  // every launch.
-  const bool shown = environment_.preferences.getAppBooleanValue(QString::fromLatin1(kShowGSMRSSIKey),
-                                                                 QString::fromLatin1(kAppPreferencesDomain));
-  if (!shown) {
-    _unsetRSSI = true;
-    _setGSMRSSI(true);
-  }
-}
+void CorvaneApp::getRSSIPref() { signalStrength_.applicationDidFinishLaunching(); }
 
 void CorvaneApp::applicationDidFinishLaunching() {
   if (running_) return;
@@ -100,11 +77,11 @@ void CorvaneApp::applicationDidFinishLaunching() {
   }
 
   _model = std::make_unique<CorvaneModel>(environment_.model, this);
-  _updateMessage = kConnectingWithDots;
-  _dateFormatter = std::make_unique<DateFormatter>(QString::fromLatin1(kUpdatePattern));
+  _statusLine = StatusLine();
 
   auto* root = new CorvanePaneController(nullptr, "/", *this);
-  root->setStatus(kConnecting, true);
+  const StatusState launching = StatusLine::launching();
+  root->setStatus(QString::fromStdString(launching.text), launching.isLoading);
 
   _navController = new NavigationController(root);
   _navController->setDelegate(this);
@@ -123,10 +100,9 @@ void CorvaneApp::applicationDidFinishLaunching() {
 void CorvaneApp::applicationWillTerminate() {
   if (!running_) return;
   running_ = false;
-  if (_unsetRSSI) _setGSMRSSI(false);
+  signalStrength_.applicationWillTerminate();
 
-  _updateMessage.clear();
-  _dateFormatter.reset();
+  _statusLine.setUpdateMessage({});
   _saveViewController = nullptr;
 
   if (_window) _window->hide();
@@ -152,33 +128,27 @@ void CorvaneApp::closeSaveView() {
 
 void CorvaneApp::updateStatusForViewController(CorvanePaneController* viewController) {
   if (!viewController) return;
-  if (_model && _model->isConnected()) {
-    viewController->setStatus(_updateMessage, false);
-  } else {
-    viewController->setStatus(kConnectingWithDots, true);
-  }
+  const StatusState status = _statusLine.current(_model && _model->isConnected());
+  viewController->setStatus(QString::fromStdString(status.text), status.isLoading);
 }
 
 void CorvaneApp::updateViewControllerFromModel() {
   if (!_navController || !_model) return;
   // A copy: a pop changes the stack during the walk.
   const std::vector<ViewController*> stack = _navController->viewControllers();
-  for (std::size_t i = 0; i < stack.size(); ++i) {
-    auto* screen = qobject_cast<CorvanePaneController*>(stack[i]);
-    if (!screen) continue;
-    if (i == 0) {
-      screen->reloadWithNode(_model->topLevelNodes());
-      continue;
-    }
-    if (NodeRef node = _model->nodeAtPath(screen->path())) {
-      screen->reloadWithNode(std::move(node));
-    } else {
-      // What this screen showed has gone from the display: back to the screen below.
-      _navController->popToViewController(stack[i - 1], true);
-      break;
-    }
+  std::vector<std::string> paths;
+  for (ViewController* screen : stack) {
+    auto* pane = qobject_cast<CorvanePaneController*>(screen);
+    paths.push_back(pane ? pane->path() : std::string());
   }
-  if (_model->isConnected()) _updateMessage = _dateFormatter->stringFromDate(currentDate());
+  const std::vector<NodeRef> nodes = refreshedScreenNodes(
+      paths, _model->topLevelNodes(), [this](const std::string& path) { return _model->nodeAtPath(path); });
+  for (std::size_t i = 0; i < nodes.size(); ++i) {
+    if (auto* screen = qobject_cast<CorvanePaneController*>(stack[i])) screen->reloadWithNode(nodes[i]);
+  }
+  // What a screen showed has gone from the display: back to the screen below.
+  if (!nodes.empty() && nodes.size() < stack.size()) _navController->popToViewController(stack[nodes.size() - 1], true);
+  _statusLine.displayUpdated(_model->isConnected(), currentDate());
   updateStatusForViewController(qobject_cast<CorvanePaneController*>(_navController->topViewController()));
 }
 

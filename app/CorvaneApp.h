@@ -20,26 +20,14 @@
 #include "app/Preferences.h"
 #include "app/ScreenHost.h"
 #include "model/CorvaneModel.h"
+#include "presenter/StatusLine.h"
 
 namespace corvane {
-
-// The key of the preference that asks the status bar for the signal strength as a number.
-inline constexpr const char* kShowGSMRSSIKey = "ZLShowGSMRSSI";
 
 struct CorvaneAppEnvironment {
   CorvaneModelEnvironment model;  // its run loop is the main queue of the screens too
   Preferences& preferences;
   std::filesystem::path deviceRoot;  // under which the phone's absolute paths are found
-};
-
-// Formats dates in local time with a fixed pattern (Qt's date-format syntax).
-class DateFormatter {
- public:
-  explicit DateFormatter(QString pattern) : pattern_(std::move(pattern)) {}
-  QString stringFromDate(const Date& date) const;
-
- private:
-  QString pattern_;
 };
 
 class CorvaneApp final : public QObject,
@@ -49,8 +37,6 @@ class CorvaneApp final : public QObject,
   Q_OBJECT
 
  public:
-  static constexpr const char* kUpdatePattern = "'Updated' yyyy-MM-dd 'at' HH:mm:ss";
-
   explicit CorvaneApp(CorvaneAppEnvironment environment);
   // Terminates first when the application was launched and not yet terminated.
   ~CorvaneApp() override;
@@ -70,8 +56,8 @@ class CorvaneApp final : public QObject,
   QWidget* window() const { return _window.get(); }
   CorvaneSaveViewController* saveViewController() const { return _saveViewController; }
   bool allowSaveButton() const override { return _allowSaveButton; }
-  const QString& updateMessage() const { return _updateMessage; }
-  void setUpdateMessage(const QString& message) { _updateMessage = message; }
+  QString updateMessage() const { return QString::fromStdString(_statusLine.updateMessage()); }
+  void setUpdateMessage(const QString& message) { _statusLine.setUpdateMessage(message.toStdString()); }
 
   NavigationController* navigationController() const { return _navController; }
   CorvaneModel* model() const { return _model.get(); }
@@ -82,10 +68,10 @@ class CorvaneApp final : public QObject,
   NavigationController* _navController = nullptr;  // owned by the window
   QPointer<CorvaneSaveViewController> _saveViewController;
   std::unique_ptr<CorvaneModel> _model;
-  bool _unsetRSSI = false;
+  PreferencesStore preferenceStore_;
+  SignalStrengthPreference signalStrength_;
   bool _allowSaveButton = false;
-  std::unique_ptr<DateFormatter> _dateFormatter;
-  QString _updateMessage;
+  StatusLine _statusLine;
 
   CorvaneAppEnvironment environment_;
   bool running_ = false;

@@ -8,11 +8,11 @@
 #include "app/ActivityIndicator.h"
 #include "app/CorvaneCell.h"
 #include "app/Theme.h"
+#include "presenter/PaneRows.h"
 
 namespace corvane {
 
 namespace {
-const QString kRootTitle = QStringLiteral("Corvane");
 constexpr int kStatusFontSize = 14;
 }  // namespace
 
@@ -93,13 +93,11 @@ void CorvanePaneController::viewWillDisappear(bool animated) {
 }
 
 void CorvanePaneController::updateTitle() {
-  setTitle(_nodes ? QString::fromStdString(_nodes->displayName()) : kRootTitle);
+  setTitle(QString::fromStdString(paneTitle(_nodes.get())));
 }
 
 const NodeRef* CorvanePaneController::childAt(int row) const {
-  const NodeArray* children = _nodes ? _nodes->childNodes() : nullptr;
-  if (!children || row < 0 || static_cast<std::size_t>(row) >= children->size()) return nullptr;
-  return &(*children)[static_cast<std::size_t>(row)];
+  return row < 0 ? nullptr : paneChildAt(_nodes.get(), static_cast<std::size_t>(row));
 }
 
 int CorvanePaneController::tableViewNumberOfRowsInSection(TableView&, int) {
@@ -111,13 +109,13 @@ TableViewCell* CorvanePaneController::tableViewCellForRowAtIndexPath(TableView& 
                                                                      const IndexPath& indexPath) {
   const NodeRef* child = childAt(indexPath.row);
   if (!child || !*child) return nullptr;
-  const CorvaneModelNode& node = **child;
+  const PaneRow row = paneRow(**child);
   const QString identifier = QString::fromLatin1(kCellIdentifier);
   // One identifier for both kinds of row, so a row made for one kind may come back for the other.
   auto* cell = static_cast<CorvaneCell*>(tableView.dequeueReusableCellWithIdentifier(identifier));
-  const QString name = QString::fromStdString(node.displayName());
+  const QString name = QString::fromStdString(row.key);
 
-  if (node.childNodes()) {
+  if (row.opens) {
     if (!cell) cell = CorvaneCell::initWithStyleKey(TableViewCell::Style::Value1, identifier);
     cell->key->setText(name);
     cell->setAccessoryType(TableViewCell::AccessoryType::DisclosureIndicator);
@@ -127,7 +125,7 @@ TableViewCell* CorvanePaneController::tableViewCellForRowAtIndexPath(TableView& 
     if (!cell) cell = CorvaneCell::initWithStyle(TableViewCell::Style::Value1, identifier);
     cell->key->setText(name);
     cell->setAccessoryType(TableViewCell::AccessoryType::None);
-    if (cell->value) cell->value->setText(node.value() ? QString::fromStdString(*node.value()) : QString());
+    if (cell->value) cell->value->setText(QString::fromStdString(row.value));
     cell->setLayout();
   }
   return cell;

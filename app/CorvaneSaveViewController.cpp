@@ -4,12 +4,8 @@
 #include <QMessageBox>
 #include <QPointer>
 
-#include <cstdio>
-
 #include "app/Theme.h"
 #include "platform/DateText.h"
-#include "platform/Log.h"
-#include "platform/PropertyList.h"
 #include "ui_CorvaneSaveViewController.h"
 
 namespace corvane {
@@ -24,22 +20,12 @@ QLabel* styleHeading(QLabel* label) {
   return label;
 }
 
-// Writes straight into the final file (no temporary file and rename): a
-// snapshot is written once and nothing else reads it while it is written.
-bool writeFile(const std::string& path, const Bytes& bytes) {
-  std::FILE* file = std::fopen(path.c_str(), "wb");
-  if (!file) return false;
-  const bool written = std::fwrite(bytes.data(), 1, bytes.size(), file) == bytes.size();
-  return std::fclose(file) == 0 && written;
-}
-
 }  // namespace
 
 CorvaneSaveViewController::CorvaneSaveViewController(const Value& saveHistory, ScreenHost& application,
                                                      RunLoop& mainQueue, std::filesystem::path snapshotDirectory)
-    : _timeStamp(currentDate()), _saveHistory(saveHistory.deepCopy()),
-      ui_(std::make_unique<Ui::CorvaneSaveViewController>()), application_(application), mainQueue_(mainQueue),
-      snapshotDirectory_(std::move(snapshotDirectory)) {
+    : saver_(saveHistory, std::move(snapshotDirectory), currentDate()), descriptions_(saver_.entryDescriptions()),
+      ui_(std::make_unique<Ui::CorvaneSaveViewController>()), application_(application), mainQueue_(mainQueue) {
   ui_->setupUi(this);
   setObjectName(QStringLiteral("CorvaneSaveViewController"));
   setTitle(ui_->titleLabel->text());
@@ -71,9 +57,7 @@ void CorvaneSaveViewController::viewDidLoad() {
   QPalette secondary = ui_->destinationLabel->palette();
   secondary.setColor(QPalette::WindowText, theme::kSecondaryText);
   ui_->destinationLabel->setPalette(secondary);
-  ui_->destinationLabel->setText(
-      tr("Written to %1 as CorvaneSnapshot-<seconds since 1970>.corvane, an XML property list.")
-          .arg(QString::fromStdString(snapshotDirectory_.string())));
+  ui_->destinationLabel->setText(QString::fromStdString(saver_.destinationText()));
   ui_->body->setAutoFillBackground(true);
   QPalette group = ui_->body->palette();
   group.setColor(QPalette::Window, theme::kGroupBackground);
@@ -90,37 +74,14 @@ void CorvaneSaveViewController::viewWillAppear(bool animated) {
   ui_->saveContentTable->sizeToFit();
 }
 
-const Array* CorvaneSaveViewController::entries() const { return _saveHistory.asArray(); }
-
-std::string CorvaneSaveViewController::snapshotFileAt(const Date& date) const {
-  // Whole seconds, rounded down also before 1970.
-  std::int64_t seconds = date.microsecondsSince1970 / 1'000'000;
-  if (date.microsecondsSince1970 % 1'000'000 < 0) --seconds;
-  char name[64];
-  std::snprintf(name, sizeof name, "CorvaneSnapshot-%ld.corvane", static_cast<long>(seconds));
-  return snapshotDirectory_.string() + "/" + name;
-}
-
 void CorvaneSaveViewController::savePressed() {
-  // The keys go in this order, and the first value missing ends the dictionary.
-  Dictionary snapshot;
-  snapshot.set("Timestamp", Value(dateText(_timeStamp)));
-  if (!_saveHistory.isNull()) {
-    snapshot.set("Data", _saveHistory);
-    snapshot.set("Description", Value(ui_->saveDescription->text().toStdString()));
-  }
-
-  const std::string file = snapshotFileAt(currentDate());
-  std::string error;
-  const std::optional<Bytes> bytes = plist::serialize(Value(snapshot), plist::Format::XML, &error);
-  if (!bytes || !writeFile(file, *bytes)) {
-    log::printf(log::kError, "Unable to write snapshot to %s", file.c_str());
+  if (!saver_.save(ui_->saveDescription->text().toStdString(), currentDate())) {
     // The alert belongs to the window, so that it stays when this screen closes.
     QWidget* owner = window() != this ? window() : nullptr;
-    auto* alert = new QMessageBox(QMessageBox::Warning, QStringLiteral("File Error"),
-                                  QStringLiteral("Unable to write file to disk"), QMessageBox::NoButton, owner);
+    auto* alert = new QMessageBox(QMessageBox::Warning, QString::fromLatin1(kFileErrorTitle),
+                                  QString::fromLatin1(kFileErrorMessage), QMessageBox::NoButton, owner);
     alert->setObjectName(QStringLiteral("FileErrorAlert"));
-    alert->addButton(QStringLiteral("Close"), QMessageBox::AcceptRole);
+    alert->addButton(QString::fromLatin1(kFileErrorButton), QMessageBox::AcceptRole);
     alert->setAttribute(Qt::WA_DeleteOnClose);
     alert->open();
   }
@@ -157,25 +118,17 @@ void CorvaneSaveViewController::keyPressEvent(QKeyEvent* event) {
 }
 
 int CorvaneSaveViewController::tableViewNumberOfRowsInSection(TableView&, int) {
-  const Array* list = entries();
-  return list ? static_cast<int>(list->size()) : 0;
+  return static_cast<int>(descriptions_.size());
 }
 
 TableViewCell* CorvaneSaveViewController::tableViewCellForRowAtIndexPath(TableView& tableView,
                                                                          const IndexPath& indexPath) {
-  const Array* list = entries();
-  if (!list || indexPath.row < 0 || static_cast<std::size_t>(indexPath.row) >= list->size()) return nullptr;
+  if (indexPath.row < 0 || static_cast<std::size_t>(indexPath.row) >= descriptions_.size()) return nullptr;
   const QString identifier = QString::fromLatin1(kCellIdentifier);
   TableViewCell* cell = tableView.dequeueReusableCellWithIdentifier(identifier);
   if (!cell) cell = new TableViewCell(TableViewCell::Style::Default, identifier);
 
-  QString description;
-  const Value& entry = list->at(static_cast<std::size_t>(indexPath.row));
-  if (const Dictionary* dictionary = entry.asDictionary()) {
-    if (const Value* text = dictionary->find("Description"); text && text->asString()) {
-      description = QString::fromStdString(*text->asString());
-    }
-  }
+  const QString description = QString::fromStdString(descriptions_[static_cast<std::size_t>(indexPath.row)]);
   QFont font(QStringLiteral("Helvetica"));
   font.setPixelSize(13);
   cell->textLabel()->setFont(font);

@@ -17,6 +17,7 @@
 #include "app/TableView.h"
 #include "platform/RunLoop.h"
 #include "platform/Value.h"
+#include "presenter/SnapshotSaver.h"
 
 namespace Ui {
 class CorvaneSaveViewController;
@@ -54,25 +55,23 @@ class CorvaneSaveViewController final : public ViewController, private TableView
   QPushButton* saveButton() const;
   QPushButton* cancelButton() const;
 
-  const Date& timeStamp() const { return _timeStamp; }
-  const Value& saveHistory() const { return _saveHistory; }
+  const Date& timeStamp() const { return saver_.timeStamp(); }
+  const Value& saveHistory() const { return saver_.saveHistory(); }
   // The file that a save at `date` writes: "<directory>/CorvaneSnapshot-<seconds since 1970>.corvane".
-  std::string snapshotFileAt(const Date& date) const;
+  std::string snapshotFileAt(const Date& date) const { return saver_.snapshotFileAt(date); }
 
  protected:
   void mousePressEvent(QMouseEvent* event) override;
   void keyPressEvent(QKeyEvent* event) override;
 
  private:
-  const Array* entries() const;
   void requestClose();
 
-  Date _timeStamp;
-  Value _saveHistory;
+  SnapshotSaver saver_;
+  std::vector<std::string> descriptions_;
   std::unique_ptr<Ui::CorvaneSaveViewController> ui_;
   ScreenHost& application_;
   RunLoop& mainQueue_;
-  std::filesystem::path snapshotDirectory_;
 };
 
 }  // namespace corvane

@@ -13,12 +13,9 @@
 #include <map>
 #include <memory>
 
-namespace corvane {
+#include "presenter/SignalStrengthPreference.h"
 
-// This application's own domain, and that of the home-screen process whose
-// status bar shows the signal strength.
-inline constexpr const char* kAppPreferencesDomain = "org.corvane.Corvane";
-inline constexpr const char* kHomeScreenPreferencesDomain = "org.corvane.HomeScreen";
+namespace corvane {
 
 inline constexpr const char* kPreferencesChangedPath = "/org/corvane/Preferences";
 inline constexpr const char* kPreferencesChangedInterface = "org.corvane.Preferences";
@@ -51,6 +48,27 @@ class Preferences {
 
   QString directory_;
   std::map<QString, std::unique_ptr<QSettings>> settings_;
+};
+
+// Preferences as the store the presenter layer reads and writes.
+class PreferencesStore final : public PreferenceStore {
+ public:
+  explicit PreferencesStore(Preferences& preferences) : preferences_(preferences) {}
+  bool getAppBooleanValue(const std::string& key, const std::string& domain) override {
+    return preferences_.getAppBooleanValue(QString::fromStdString(key), QString::fromStdString(domain));
+  }
+  void setAppValue(const std::string& key, bool value, const std::string& domain) override {
+    preferences_.setAppValue(QString::fromStdString(key), value, QString::fromStdString(domain));
+  }
+  bool synchronize(const std::string& domain) override {
+    return preferences_.synchronize(QString::fromStdString(domain));
+  }
+  void SendAppPreferencesChanged(const std::string& domain, const std::string& key) override {
+    preferences_.SendAppPreferencesChanged(QString::fromStdString(domain), QString::fromStdString(key));
+  }
+
+ private:
+  Preferences& preferences_;
 };
 
 }  // namespace corvane

@@ -43,7 +43,8 @@ const corvane::ProgramUsage kProgram{
     "corvane-demo",
     "Usage: corvane-demo [--technology NAME] [--seed N] [--device-root DIR]\n"
     "       corvane-demo --replay FILE [--technology NAME] [--speed X] [--loop] [--device-root DIR]\n"
-    "       corvane-demo --diag DEVICE --technology NAME [--device-root DIR]\n",
+    "       corvane-demo --diag DEVICE --technology NAME [--device-root DIR]\n"
+    "       corvane-demo --tui [OPTIONS]\n",
     "\n"
     "Starts the telephony service with its built-in simulator, playing a\n"
     "capture, or bridging a baseband's diagnostic port, and the Corvane\n"
@@ -63,10 +64,15 @@ const corvane::ProgramUsage kProgram{
     "                         holds the marker that offers saving and the\n"
     "                         snapshots (default: $XDG_STATE_HOME/corvane/demo-device,\n"
     "                         else ~/.local/state/corvane/demo-device)\n"
+    "      --tui              run corvane-tui, the screens in this terminal, instead\n"
+    "                         of the window (no display needed); the service's\n"
+    "                         messages go to var/log/corvane/corvane-telephonyd.log\n"
+    "                         below the device root\n"
     "  -h, --help             show this help\n"
     "  -V, --version          show the version\n"
     "\n"
-    "Needs a display; without one, run it under xvfb-run -a, or use corvane-monitor.\n",
+    "Needs a display, unless --tui; without one, run it under xvfb-run -a, use\n"
+    "--tui, or use corvane-monitor.\n",
 };
 
 int fail(const std::string& message) {
@@ -93,7 +99,9 @@ fs::path findProgram(const std::string& name, const std::vector<fs::path>& candi
 
 // Starts a program with the termination signals at their defaults and unblocked,
 // and with `extra` ("NAME=value") added to the environment.
-pid_t spawn(const std::vector<std::string>& argv, const std::vector<std::string>& extra, std::string& error) {
+// `output`, when given, takes the child's standard output and error (appended).
+pid_t spawn(const std::vector<std::string>& argv, const std::vector<std::string>& extra, std::string& error,
+            const fs::path* output = nullptr) {
   std::vector<std::string> environment;
   for (char** entry = environ; *entry; ++entry) {
     const std::string text = *entry;
@@ -123,8 +131,15 @@ pid_t spawn(const std::vector<std::string>& argv, const std::vector<std::string>
   posix_spawnattr_setsigmask(&attributes, &none);
   posix_spawnattr_setsigdefault(&attributes, &defaults);
   posix_spawnattr_setflags(&attributes, POSIX_SPAWN_SETSIGMASK | POSIX_SPAWN_SETSIGDEF);
+  posix_spawn_file_actions_t actions;
+  posix_spawn_file_actions_init(&actions);
+  if (output) {
+    posix_spawn_file_actions_addopen(&actions, STDOUT_FILENO, output->c_str(), O_WRONLY | O_CREAT | O_APPEND, 0644);
+    posix_spawn_file_actions_adddup2(&actions, STDOUT_FILENO, STDERR_FILENO);
+  }
   pid_t pid = -1;
-  const int status = posix_spawnp(&pid, args[0], nullptr, &attributes, args.data(), env.data());
+  const int status = posix_spawnp(&pid, args[0], &actions, &attributes, args.data(), env.data());
+  posix_spawn_file_actions_destroy(&actions);
   posix_spawnattr_destroy(&attributes);
   if (status != 0) {
     error = "cannot start " + argv[0] + ": " + std::strerror(status);
@@ -170,6 +185,7 @@ int main(int argc, char** argv) {
   std::optional<std::string> speed;
   bool loop = false;
   std::optional<fs::path> diagPort;
+  bool terminal = false;
   fs::path root = defaultDeviceRoot();
 
   static constexpr corvane::CommandLineOption kOptions[] = {
@@ -180,6 +196,7 @@ int main(int argc, char** argv) {
       {"speed", 0, true},
       {"loop", 0, false},
       {"diag", 0, true},
+      {"tui", 0, false},
   };
   const corvane::ParsedCommandLine parsed = corvane::parseCommandLine(
       argc, argv, kOptions, [&](std::string_view name, const char* value) -> std::string {
@@ -192,6 +209,7 @@ int main(int argc, char** argv) {
         if (name == "replay") replay = fs::absolute(value);
         if (name == "speed") speed = value;
         if (name == "loop") loop = true;
+        if (name == "tui") terminal = true;
         if (name == "diag") diagPort = fs::absolute(value);
         if (name == "seed") {
           char* end = nullptr;
@@ -209,7 +227,8 @@ int main(int argc, char** argv) {
     return corvane::usageError(kProgram, std::string(speed ? "--speed" : "--loop") + " is for --replay");
   }
 
-  if (!corvane::displayAvailable()) return fail(corvane::noDisplayMessage("corvane-demo"));
+  if (!terminal && !corvane::displayAvailable()) return fail(corvane::noDisplayMessage("corvane-demo"));
+  if (terminal && (!::isatty(STDIN_FILENO) || !::isatty(STDOUT_FILENO))) return fail("--tui needs a terminal");
 
   std::error_code error;
   const fs::path marker = corvane::devicePath(corvane::kSaveEnablingMarkerPath, root);
@@ -231,7 +250,10 @@ int main(int argc, char** argv) {
   const fs::path self = fs::read_symlink("/proc/self/exe", error).parent_path();
   const fs::path serviceProgram =
       findProgram("corvane-telephonyd", {self / "corvane-telephonyd", self.parent_path() / "telephonyd" / "corvane-telephonyd"});
-  const fs::path appProgram = findProgram("corvane", {self / "corvane"});
+  const fs::path appProgram = terminal ? findProgram("corvane-tui", {self / "corvane-tui", self.parent_path() / "tui" / "corvane-tui"})
+                                       : findProgram("corvane", {self / "corvane"});
+  // The terminal belongs to corvane-tui: the service writes into a file instead.
+  const fs::path serviceLog = corvane::devicePath("/var/log/corvane/corvane-telephonyd.log", root);
   const std::vector<std::string> environment{"CORVANE_RUNTIME_DIR=" + runtime.string(),
                                              "CORVANE_DEVICE_ROOT=" + root.string()};
 
@@ -262,7 +284,7 @@ int main(int argc, char** argv) {
       serviceArguments.insert(serviceArguments.end(), {"--rate", technology == "Quendra_CDMA" ? "20" : "10"});
     }
   }
-  const pid_t service = spawn(serviceArguments, environment, spawnError);
+  const pid_t service = spawn(serviceArguments, environment, spawnError, terminal ? &serviceLog : nullptr);
   if (service < 0) {
     cleanUp(-1);
     return fail(spawnError);
@@ -288,7 +310,9 @@ int main(int argc, char** argv) {
     cleanUp(service);
     return fail(spawnError);
   }
-  if (diagPort) {
+  if (terminal) {
+    // Nothing more on the terminal while corvane-tui draws on it.
+  } else if (diagPort) {
     std::printf("corvane-demo: Corvane and the bridge to %s are running; Ctrl-C stops both.\n", diagPort->c_str());
   } else if (replay) {
     std::printf("corvane-demo: Corvane and a replay of %s are running; Ctrl-C stops both.\n", replay->c_str());
@@ -296,7 +320,7 @@ int main(int argc, char** argv) {
     std::printf("corvane-demo: Corvane and the %s simulator (seed %s) are running; Ctrl-C stops both.\n",
                 technology.c_str(), seed.c_str());
   }
-  std::printf("corvane-demo: snapshots are saved in %s\n", snapshots.c_str());
+  if (!terminal) std::printf("corvane-demo: snapshots are saved in %s\n", snapshots.c_str());
   std::fflush(stdout);
 
   bool serviceRunning = true;
@@ -320,5 +344,9 @@ int main(int argc, char** argv) {
   }
 
   cleanUp(serviceRunning ? service : -1);
+  if (terminal) {
+    std::printf("corvane-demo: snapshots are saved in %s; the service's messages are in %s\n", snapshots.c_str(),
+                serviceLog.c_str());
+  }
   return stopping ? 0 : exitStatusOf(appStatus);
 }

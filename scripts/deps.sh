@@ -9,6 +9,7 @@ packages=(
   qt6-base-dev libplist-dev nlohmann-json3-dev libcrcutil-dev
   libgtest-dev libgmock-dev libbenchmark-dev
   libqt6svg6 fonts-dejavu-core libplist-utils xvfb xauth dbus-daemon
+  libncurses-dev tmux
 )
 
 missing=()

@@ -3,7 +3,8 @@
 # the demo: the service with its built-in simulator, and the application
 # connected to it, until the application quits (or Ctrl-C). Extra arguments go
 # to corvane-demo (e.g. --seed 7, or --replay FILE to play a capture instead).
-# Without a display, run it under xvfb-run -a, or use --headless.
+# Without a display, on a terminal (a machine reached over SSH), it runs the
+# demo in the terminal with corvane-tui; --headless prints text dumps instead.
 #
 #   bash scripts/run.sh --headless [SERVICE-OPTIONS] [ARGS]
 #                                           the service (simulating IFX, or as
@@ -53,6 +54,9 @@ if [ "${1:-}" = "--headless" ]; then
   exit
 fi
 
-cmake --build build/release -j "$(nproc)" --target corvane corvane-demo corvane-telephonyd corvane-monitor \
-  corvane-decode corvane-fake-baseband >/dev/null
+cmake --build build/release -j "$(nproc)" --target corvane corvane-demo corvane-tui corvane-telephonyd \
+  corvane-monitor corvane-decode corvane-fake-baseband >/dev/null
+if [ -z "${DISPLAY:-}" ] && [ -z "${WAYLAND_DISPLAY:-}" ] && [ -t 0 ] && [ -t 1 ]; then
+  exec build/release/app/corvane-demo --tui "$@"
+fi
 exec build/release/app/corvane-demo "$@"
