@@ -5,10 +5,11 @@
 #include <QScreen>
 #include <QVBoxLayout>
 
+#include <algorithm>
+
 #include "app/Theme.h"
 #include "platform/DateText.h"
 #include "platform/DevicePaths.h"
-#include "presenter/ScreenStack.h"
 #include "presenter/SnapshotSaver.h"
 
 namespace corvane {
@@ -79,7 +80,9 @@ void CorvaneApp::applicationDidFinishLaunching() {
   _model = std::make_unique<CorvaneModel>(environment_.model, this);
   _statusLine = StatusLine();
 
-  auto* root = new CorvanePaneController(nullptr, "/", *this);
+  _screens = ScreenStack();
+  _screens.setWillShow([this](const ScreenStack::Screen&) { followScreens(); });
+  auto* root = new CorvanePaneController(nullptr, _screens.top().path, *this);
   const StatusState launching = StatusLine::launching();
   root->setStatus(QString::fromStdString(launching.text), launching.isLoading);
 
@@ -134,27 +137,40 @@ void CorvaneApp::updateStatusForViewController(CorvanePaneController* viewContro
 
 void CorvaneApp::updateViewControllerFromModel() {
   if (!_navController || !_model) return;
-  // A copy: a pop changes the stack during the walk.
-  const std::vector<ViewController*> stack = _navController->viewControllers();
-  std::vector<std::string> paths;
-  for (ViewController* screen : stack) {
-    auto* pane = qobject_cast<CorvanePaneController*>(screen);
-    paths.push_back(pane ? pane->path() : std::string());
+  // The screen stack pops what has gone from the display; the panes follow it.
+  _screens.reload(_model->topLevelNodes(), [this](const std::string& path) { return _model->nodeAtPath(path); });
+  const std::vector<ViewController*>& panes = _navController->viewControllers();
+  const std::vector<ScreenStack::Screen>& screens = _screens.screens();
+  for (std::size_t i = 0; i < std::min(panes.size(), screens.size()); ++i) {
+    if (auto* pane = qobject_cast<CorvanePaneController*>(panes[i])) pane->reloadWithNode(screens[i].node);
   }
-  const std::vector<NodeRef> nodes = refreshedScreenNodes(
-      paths, _model->topLevelNodes(), [this](const std::string& path) { return _model->nodeAtPath(path); });
-  for (std::size_t i = 0; i < nodes.size(); ++i) {
-    if (auto* screen = qobject_cast<CorvanePaneController*>(stack[i])) screen->reloadWithNode(nodes[i]);
-  }
-  // What a screen showed has gone from the display: back to the screen below.
-  if (!nodes.empty() && nodes.size() < stack.size()) _navController->popToViewController(stack[nodes.size() - 1], true);
   _statusLine.displayUpdated(_model->isConnected(), currentDate());
   updateStatusForViewController(qobject_cast<CorvanePaneController*>(_navController->topViewController()));
 }
 
-void CorvaneApp::navigationControllerWillShowViewController(NavigationController&, ViewController* viewController,
-                                                            bool) {
-  updateStatusForViewController(qobject_cast<CorvanePaneController*>(viewController));
+void CorvaneApp::navigationControllerWillShowViewController(NavigationController& navigationController,
+                                                            ViewController* viewController, bool) {
+  // A pane pushes the section it opens itself, and the back button pops; the
+  // screen stack is told either way, so that both stay one stack.
+  const std::vector<ViewController*>& panes = navigationController.viewControllers();
+  const auto shown = std::find(panes.begin(), panes.end(), viewController);
+  auto* pane = qobject_cast<CorvanePaneController*>(viewController);
+  if (shown != panes.end()) {
+    const auto depth = static_cast<std::size_t>(shown - panes.begin()) + 1;
+    if (depth > _screens.depth()) {
+      if (pane) _screens.openPath(pane->path());
+    } else {
+      _screens.popToDepth(depth);
+    }
+  }
+  updateStatusForViewController(pane);
+}
+
+void CorvaneApp::followScreens() {
+  if (!_navController) return;
+  // The screen stack popped (its screen's row vanished): the panes above go too.
+  const std::vector<ViewController*>& panes = _navController->viewControllers();
+  if (panes.size() > _screens.depth()) _navController->popToViewController(panes[_screens.depth() - 1], true);
 }
 
 }  // namespace corvane

@@ -2,7 +2,8 @@
 
 // The application object: builds the window and the stack of list screens,
 // runs the monitor model, keeps the status line of the visible screen current,
-// re-points every screen to the fresh display tree after each update, turns on
+// keeps the panes and the presenter's screen stack one stack, re-points every
+// screen to the fresh display tree after each update, turns on
 // the numeric signal strength of the home screen's status bar while it runs,
 // and opens and closes the save screen where saving is offered.
 
@@ -20,6 +21,7 @@
 #include "app/Preferences.h"
 #include "app/ScreenHost.h"
 #include "model/CorvaneModel.h"
+#include "presenter/ScreenStack.h"
 #include "presenter/StatusLine.h"
 
 namespace corvane {
@@ -60,10 +62,14 @@ class CorvaneApp final : public QObject,
   void setUpdateMessage(const QString& message) { _statusLine.setUpdateMessage(message.toStdString()); }
 
   NavigationController* navigationController() const { return _navController; }
+  // The stack of screens the panes show, shared in kind with the terminal front end.
+  const ScreenStack& screenStack() const { return _screens; }
   CorvaneModel* model() const { return _model.get(); }
   std::filesystem::path snapshotDirectory() const;
 
  private:
+  void followScreens();
+
   std::unique_ptr<QWidget> _window;
   NavigationController* _navController = nullptr;  // owned by the window
   QPointer<CorvaneSaveViewController> _saveViewController;
@@ -72,6 +78,7 @@ class CorvaneApp final : public QObject,
   SignalStrengthPreference signalStrength_;
   bool _allowSaveButton = false;
   StatusLine _statusLine;
+  ScreenStack _screens;
 
   CorvaneAppEnvironment environment_;
   bool running_ = false;

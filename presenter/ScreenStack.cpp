@@ -53,9 +53,26 @@ bool ScreenStack::openSelected() {
   return true;
 }
 
-bool ScreenStack::pop() {
-  if (screens_.size() < 2) return false;
-  screens_.pop_back();
+bool ScreenStack::openPath(const std::string& path) {
+  const Screen& current = screens_.back();
+  const NodeArray* children = current.node ? current.node->childNodes() : nullptr;
+  if (!children) return false;
+  for (std::size_t row = 0; row < children->size(); ++row) {
+    const NodeRef& child = (*children)[row];
+    if (child && appendPathComponent(current.path, child->displayName()) == path) {
+      select(row);
+      return openSelected();
+    }
+  }
+  return false;
+}
+
+bool ScreenStack::pop() { return popToDepth(screens_.size() - 1); }
+
+bool ScreenStack::popToDepth(std::size_t depth) {
+  depth = std::max<std::size_t>(depth, 1);
+  if (depth >= screens_.size()) return false;
+  screens_.resize(depth);
   if (willShow_) willShow_(screens_.back());
   return true;
 }

@@ -54,8 +54,14 @@ class ScreenStack {
   void select(std::size_t row);
   // Opens the selected row of the top screen when it is a section; false otherwise.
   bool openSelected();
+  // Opens the section of the top screen whose path is `path` (a front end
+  // that opens screens itself tells the stack so); false when the top screen
+  // has no such section.
+  bool openPath(const std::string& path);
   // Pops the top screen (never the root); false at the root.
   bool pop();
+  // Pops until `depth` screens are left (at least the root); false when none was popped.
+  bool popToDepth(std::size_t depth);
 
   // Re-points every screen at the fresh tree; the selection follows its row's key.
   void reload(NodeRef root, const std::function<NodeRef(const std::string&)>& nodeAtPath);

@@ -125,6 +125,40 @@ class CorvaneAppTest : public QObject {
     QCOMPARE(test::statusTextOf(serving), QStringLiteral("Updated 2026-11-16 at 11:00:00"));
   }
 
+  void theScreenStackFollowsEveryPushBackAndVanishedRow() {
+    test::AppHarness harness;
+    harness.launch();
+    harness.send(servingCell("62", true));
+    harness.tick();
+    const ScreenStack& screens = harness.app().screenStack();
+    QCOMPARE(screens.depth(), harness.depth());
+
+    const int servingRow = test::rowWithKey(harness.top(), QStringLiteral("Serving Cell"));
+    test::tapRow(harness.top(), servingRow);
+    QCOMPARE(screens.depth(), std::size_t{2});
+    QCOMPARE(screens.top().path, std::string("/Serving Cell"));
+    QCOMPARE(screens.screens()[0].selectedRow, static_cast<std::size_t>(servingRow));
+    QCOMPARE(screens.top().node, harness.top()->node());
+
+    harness.app().navigationController()->backButton()->click();
+    QCOMPARE(screens.depth(), std::size_t{1});
+    QCOMPARE(harness.depth(), std::size_t{1});
+
+    test::tapRow(harness.top(), servingRow);
+    test::tapRow(harness.top(), test::rowWithKey(harness.top(), QStringLiteral("Band")));
+    QCOMPARE(screens.depth(), std::size_t{3});
+    QCOMPARE(screens.title(), std::string("Band"));
+    QCOMPARE(screens.backTitle(), std::string("Serving Cell"));
+
+    // The row under the open screen vanishes: the stack and the panes pop together.
+    harness.send(servingCell("63", false));
+    harness.tick();
+    QCOMPARE(screens.depth(), std::size_t{2});
+    QCOMPARE(harness.depth(), std::size_t{2});
+    QCOMPARE(screens.top().path, harness.top()->path());
+    QCOMPARE(screens.top().node, harness.top()->node());
+  }
+
   void whileDisconnectedTheTopScreenSaysConnectingWithDotsAndKeepsTheLastUpdateTime() {
     log::ScopedCapture log;
     test::AppHarness harness;

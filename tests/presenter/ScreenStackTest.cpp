@@ -66,6 +66,47 @@ TEST(ScreenStack, BackReturnsToTheSameSelectionAndTellsWillShow) {
   EXPECT_EQ(f.shown.size(), 2u);
 }
 
+TEST(ScreenStack, OpeningByPathSelectsThatRowAndPushesItsScreen) {
+  StackFixture f;
+  ASSERT_TRUE(f.stack.openPath("/Neighbours"));
+  EXPECT_EQ(f.stack.depth(), 2u);
+  EXPECT_EQ(f.stack.top().path, "/Neighbours");
+  EXPECT_EQ(f.stack.screens()[0].selectedRow, 1u);
+  EXPECT_EQ(f.shown, std::vector<std::string>{"/Neighbours"});
+  // Only a section of the top screen opens.
+  EXPECT_FALSE(f.stack.openPath("/Serving Cell"));
+  EXPECT_FALSE(f.stack.openPath("/Neighbours/Nowhere"));
+  EXPECT_EQ(f.stack.depth(), 2u);
+}
+
+TEST(ScreenStack, OpeningByPathRefusesLeavesAndUnknownRows) {
+  StackFixture f;
+  EXPECT_FALSE(f.stack.openPath("/Technology"));  // a value, not a section
+  EXPECT_FALSE(f.stack.openPath("/Elsewhere"));
+  EXPECT_EQ(f.stack.depth(), 1u);
+  EXPECT_TRUE(f.shown.empty());
+  ScreenStack empty;  // no node yet: nothing to open
+  EXPECT_FALSE(empty.openPath("/Serving Cell"));
+}
+
+TEST(ScreenStack, PoppingToADepthTellsWillShowOnceForTheScreenUncovered) {
+  StackFixture f;
+  f.tree = test::Tree(D({{"A", D({{"B", D({{"C", D({{"x", S("1")}})}})}})}}));
+  f.reload();
+  ASSERT_TRUE(f.stack.openSelected());
+  ASSERT_TRUE(f.stack.openSelected());
+  ASSERT_TRUE(f.stack.openSelected());
+  f.shown.clear();
+  EXPECT_FALSE(f.stack.popToDepth(4));  // already there
+  ASSERT_TRUE(f.stack.popToDepth(2));
+  EXPECT_EQ(f.stack.top().path, "/A");
+  EXPECT_EQ(f.shown, std::vector<std::string>{"/A"});
+  ASSERT_TRUE(f.stack.popToDepth(0));  // the root always stays
+  EXPECT_EQ(f.stack.depth(), 1u);
+  EXPECT_FALSE(f.stack.popToDepth(0));
+  EXPECT_EQ(f.shown, (std::vector<std::string>{"/A", "/"}));
+}
+
 TEST(ScreenStack, SelectionIsClampedToTheRows) {
   StackFixture f;
   f.stack.select(99);
