@@ -22,6 +22,12 @@ struct StackFixture {
   void reload() {
     stack.reload(tree.root, [this](const std::string& path) { return tree.at(path); });
   }
+  // Shows a tree three sections deep and opens down to "/A/B/C".
+  bool openThreeDeep() {
+    tree = test::Tree(D({{"A", D({{"B", D({{"C", D({{"x", S("1")}})}})}})}}));
+    reload();
+    return stack.openSelected() && stack.openSelected() && stack.openSelected();
+  }
 };
 
 TEST(ScreenStack, StartsWithTheRootWithoutNodeTitledCorvane) {
@@ -91,11 +97,7 @@ TEST(ScreenStack, OpeningByPathRefusesLeavesAndUnknownRows) {
 
 TEST(ScreenStack, PoppingToADepthTellsWillShowOnceForTheScreenUncovered) {
   StackFixture f;
-  f.tree = test::Tree(D({{"A", D({{"B", D({{"C", D({{"x", S("1")}})}})}})}}));
-  f.reload();
-  ASSERT_TRUE(f.stack.openSelected());
-  ASSERT_TRUE(f.stack.openSelected());
-  ASSERT_TRUE(f.stack.openSelected());
+  ASSERT_TRUE(f.openThreeDeep());
   f.shown.clear();
   EXPECT_FALSE(f.stack.popToDepth(4));  // already there
   ASSERT_TRUE(f.stack.popToDepth(2));
@@ -147,11 +149,7 @@ TEST(ScreenStack, RefreshRepointsEveryScreenAtTheFreshTree) {
 
 TEST(ScreenStack, SectionGoneFromTheDisplayPopsToTheScreenBelow) {
   StackFixture f;
-  f.tree = test::Tree(D({{"A", D({{"B", D({{"C", D({{"x", S("1")}})}})}})}}));
-  f.reload();
-  ASSERT_TRUE(f.stack.openSelected());
-  ASSERT_TRUE(f.stack.openSelected());
-  ASSERT_TRUE(f.stack.openSelected());
+  ASSERT_TRUE(f.openThreeDeep());
   EXPECT_EQ(f.stack.top().path, "/A/B/C");
   f.shown.clear();
   f.tree = test::Tree(D({{"A", D({{"Other", S("2")}})}}));
