@@ -2,7 +2,7 @@
 # tui-end-to-end.sh TUI TELEPHONYD DECODE DEMO: drives corvane-tui in a tmux pane
 # (send-keys, capture-pane) against corvane-telephonyd and its LTE simulator:
 # the root lists the sections, a section shows its rows, back keeps the
-# selection, a saved snapshot reads back, a resize to 60x20 and back keeps
+# selection, the mouse selects, opens, goes back and scrolls, a saved snapshot reads back, a resize to 60x20 and back keeps
 # working, the service going away shows "Connecting..." and its return the
 # tree again, and the home screen's numeric signal strength is on while it
 # runs; then the same screens on a plain ASCII terminal without colour, and
@@ -119,6 +119,31 @@ wait_for_line 22 "Serving Cell Measurements"
 keys BSpace
 wait_for_line 22 "Serving Cell"
 line 0 | grep -q "‹" && fail "the root shows a way back"
+
+# The mouse, as a terminal reports it in its basic (X10) form: ESC [ M, then
+# the button, column and line, each plus 32 (and the column and line from 1).
+mouse() {  # $1: button code (0 left, 3 release, 64 wheel up, 65 wheel down); $2 column, $3 line, from 0
+  keys -l "$(printf "\\033[M\\$(printf %03o $(($1 + 32)))\\$(printf %03o $(($2 + 33)))\\$(printf %03o $(($3 + 33)))")"
+}
+click() { mouse 0 "$1" "$2"; mouse 3 "$1" "$2"; }
+# A click selects a row, a second click on it opens it, a click on the title line goes back.
+click 4 3
+wait_for_line 22 "Reselection"
+line 0 | grep -q "‹" && fail "the first click opened the row"
+click 4 3
+wait_for_line 0 "‹ Corvane"
+line 0 | grep -q "Reselection" || fail "the second click did not open the row it selected"
+click 10 0
+wait_for_line 1 "Serving Cell"
+line 0 | grep -q "‹" && fail "a click on the title line did not go back"
+line 22 | grep -q "^ Reselection\$" || fail "back after a click did not keep the selection"
+# The wheel moves the selection.
+mouse 65 4 3
+wait_for_line 22 "PDP Context Info"
+mouse 64 4 3
+wait_for_line 22 "Neighbours"
+keys Home
+wait_for_line 22 "Serving Cell"
 
 # The filter keeps the rows that match.
 keys Down Down Down "/" "S" "I" "M"
