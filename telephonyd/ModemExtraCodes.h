@@ -13,6 +13,7 @@
 #include <functional>
 #include <memory>
 #include <set>
+#include <utility>
 
 #include "platform/RunLoop.h"
 #include "telephonyd/ModemClient.h"
@@ -33,7 +34,7 @@ class ModemExtraCodes {
   ModemExtraCodes& operator=(const ModemExtraCodes&) = delete;
 
   // Where the packets go (the service offers them to its channels).
-  void setEmitter(std::function<void(const SourcePacket&)> emit) { emit_ = std::move(emit); }
+  void setEmitter(std::function<void(const SourcePacket&)> emitter) { emit_ = std::move(emitter); }
   // The extra codes the streaming channels ask for, each less 0xFF0000.
   void setWantedCodes(const std::set<std::uint32_t>& extraCodes);
 

@@ -393,6 +393,10 @@ void ModemManagerClient::Impl::evaluate() {
   std::vector<modem::ModemCandidate> candidates;
   for (GList* entry = objects; entry; entry = entry->next) {
     auto* candidate = static_cast<MMObject*>(entry->data);
+    // The object manager also lists SIMs and bearers: only modems are candidates.
+    GDBusInterface* modemInterface = g_dbus_object_get_interface(G_DBUS_OBJECT(candidate), MM_DBUS_INTERFACE_MODEM);
+    if (!modemInterface) continue;
+    g_object_unref(modemInterface);
     MMModem* proxy = mm_object_peek_modem(candidate);
     if (!proxy) continue;
     modem::ModemCandidate described;
@@ -540,7 +544,9 @@ void ModemManagerClient::Impl::updateSim() {
       state.preferredNetworks.push_back(
           {code ? code : "", static_cast<std::uint32_t>(mm_sim_preferred_network_get_access_technology(network))});
     }
-    mm_sim_preferred_network_list_free(preferred);
+    g_list_free_full(preferred, [](gpointer network) {
+      mm_sim_preferred_network_free(static_cast<MMSimPreferredNetwork*>(network));
+    });
   }
   {
     std::lock_guard lock(mutex);

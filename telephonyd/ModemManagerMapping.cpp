@@ -335,10 +335,7 @@ std::optional<std::size_t> chooseModem(const std::vector<ModemCandidate>& modems
       const std::string& path = modems[i].path;
       const std::size_t slash = path.rfind('/');
       const std::string_view index = slash == std::string::npos ? std::string_view() : std::string_view(path).substr(slash + 1);
-      const bool matches = allDigits(choice) ? index == choice
-                           : choice.front() == '/' ? path == choice
-                                                   : modems[i].equipmentIdentifier == choice;
-      if (matches) return i;
+      if (index == choice || path == choice || modems[i].equipmentIdentifier == choice) return i;
     }
     why = "ModemManager knows no modem " + std::string(choice);
     return std::nullopt;

@@ -44,6 +44,7 @@ inline constexpr std::uint32_t kIpFamilyNonIp = 1u << 3;
 struct PreferredNetwork {
   std::string operatorCode;            // MCC and MNC digits, such as "00101"
   std::uint32_t accessTechnologies = 0;  // kAccess... bits
+  friend bool operator==(const PreferredNetwork&, const PreferredNetwork&) = default;
 };
 
 // The SIM and the modem's own numbers.

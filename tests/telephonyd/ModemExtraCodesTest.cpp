@@ -79,7 +79,9 @@ TEST_F(ModemExtraCodesTest, SimAndContextsAreSentAtOnceAndTheCellsReadWhenAChann
   EXPECT_EQ(modem_->refreshes[ModemClient::Part::Cells], 1);
   const Dictionary* files = payloads_[0].asDictionary();
   ASSERT_TRUE(files);
-  EXPECT_EQ(files->get("kSimFile_ICCID").asString() ? *files->get("kSimFile_ICCID").asString() : "", "8949");
+  const Value* iccid = files->find("kSimFile_ICCID");
+  ASSERT_TRUE(iccid && iccid->asString());
+  EXPECT_EQ(*iccid->asString(), "8949");
   ASSERT_TRUE(payloads_[1].asArray());
   EXPECT_EQ(payloads_[1].asArray()->size(), 1u);
   // The cells read: the list goes out.

@@ -138,6 +138,8 @@ def _add_modem(mock):
                         signature='sv'),
         dbus.Dictionary({'profile-id': dbus.Int32(2), 'apn': 'ims', 'ip-type': dbus.UInt32(2)}, signature='sv'),
     ], signature='a{sv}')
+    # The object manager says so only when told to, once the object has all its interfaces.
+    mock.object_manager_emit_added(MODEM_PATH)
 
 
 def _object(mock, path):
@@ -186,12 +188,15 @@ def load(mock, parameters):
         'ProfileId': dbus.Int32(1),
         'Properties': dbus.Dictionary({'apn': 'internet', 'ip-type': dbus.UInt32(IP_FAMILY_IPV4V6)}, signature='sv'),
     }, [])
+    mock.object_manager_emit_added(SIM_PATH)
+    mock.object_manager_emit_added(BEARER_PATH)
     if parameters.get('modem', True):
         _add_modem(mock)
 
 
 @dbus.service.method(CONTROL_IFACE, in_signature='', out_signature='')
 def RemoveModem(self):
+    self.object_manager_emit_removed(MODEM_PATH)
     self.RemoveObject(MODEM_PATH)
 
 
