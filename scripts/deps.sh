@@ -10,6 +10,7 @@ packages=(
   libgtest-dev libgmock-dev libbenchmark-dev
   libqt6svg6 fonts-dejavu-core libplist-utils xvfb xauth dbus-daemon
   libncurses-dev tmux
+  libglib2.0-dev libmm-glib-dev python3-dbusmock
 )
 
 missing=()

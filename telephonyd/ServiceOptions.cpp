@@ -50,7 +50,7 @@ const ProgramUsage kProgram{
     "corvane-telephonyd",
     "Usage: corvane-telephonyd [OPTION]...\n"
     "       corvane-telephonyd --replay FILE [--technology NAME] [--speed X | --as-fast-as-possible] [--loop]\n"
-    "       corvane-telephonyd --diag DEVICE --technology NAME\n",
+    "       corvane-telephonyd --diag DEVICE --technology NAME [--modem INDEX|PATH|IMEI]\n",
     "Serve network-monitor log channels to Corvane from the built-in simulator,\n"
     "from a capture file played back, or from a baseband's diagnostic port.\n"
     "\n"
@@ -77,7 +77,11 @@ const ProgramUsage kProgram{
     "                         or a WWAN diagnostic device such as /dev/wwan0qcdm0):\n"
     "                         the log codes the channels ask for become its log\n"
     "                         mask, and its log records their packets; needs\n"
-    "                         --technology, the decoder the baseband's codes are for\n"
+    "                         --technology, the decoder the baseband's codes are for;\n"
+    "                         the extra codes come from ModemManager (system D-Bus)\n"
+    "      --modem MODEM      with --diag: the ModemManager modem to report, by index,\n"
+    "                         object path or IMEI (default: the one whose ports include\n"
+    "                         DEVICE, else the only one)\n"
     "      --log-stderr       copy log lines to standard error\n"
     "  -h, --help             show this help and exit\n"
     "  -V, --version          show the version and exit\n"
@@ -102,7 +106,7 @@ ParsedOptions parseServiceOptions(int argc, char** argv) {
       {"technology", 't', true},  {"seed", 's', true},        {"rate", 'r', true},
       {"packets", 'n', true},     {"clock-start", 0, true},   {"log-stderr", 0, false},
       {"replay", 0, true},        {"speed", 0, true},         {"as-fast-as-possible", 0, false},
-      {"loop", 0, false},         {"diag", 0, true},
+      {"loop", 0, false},         {"diag", 0, true},          {"modem", 0, true},
   };
   bool rateGiven = false;
   bool seedGiven = false;
@@ -133,6 +137,10 @@ ParsedOptions parseServiceOptions(int argc, char** argv) {
         if (name == "diag") {
           if (!*value) return std::string("--diag needs a device");
           options.diag = value;
+        }
+        if (name == "modem") {
+          if (!*value) return std::string("--modem needs an index, an object path or an IMEI");
+          options.modem = value;
         }
         if (name == "rate" && !parseRate(value, options.rate)) {
           return "invalid rate '" + std::string(value) + "': give packets per second, or 0 or max";
@@ -167,6 +175,7 @@ ParsedOptions parseServiceOptions(int argc, char** argv) {
   }
 
   const ServiceOptions& options = parsed.options;
+  if (!options.modem.empty() && !options.diag) return failure("--modem is for --diag");
   if (options.diag) {
     if (options.replay) return failure("give --diag or --replay, not both");
     if (!options.technologyGiven) {

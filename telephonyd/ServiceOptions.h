@@ -31,6 +31,9 @@ struct ServiceOptions {
 
   // A baseband's diagnostic port to bridge instead of simulating.
   std::optional<std::string> diag;
+  // With --diag: the modem whose SIM, cells and contexts ModemManager reports
+  // (an index, an object path or an IMEI); empty for the default.
+  std::string modem;
 };
 
 struct ParsedOptions {

@@ -72,6 +72,7 @@ TelephonyService::TelephonyService(SocketPortSystem& ports, RunLoop& runLoop, st
 TelephonyService::~TelephonyService() {
   stop();
   *alive_ = false;
+  modemExtraCodes_.reset();
 }
 
 bool TelephonyService::start(std::string& error) {
@@ -234,12 +235,26 @@ void TelephonyService::endChannel(const std::string& name, const std::string& re
   updateWantedCodes();
 }
 
+void TelephonyService::setModemExtraCodes(std::unique_ptr<ModemExtraCodes> extraCodes) {
+  modemExtraCodes_ = std::move(extraCodes);
+  modemExtraCodes_->setEmitter([this](const SourcePacket& packet) {
+    for (auto& [name, channel] : channels_) {
+      offer(*channel, packet);
+      flush(*channel);
+    }
+  });
+}
+
 void TelephonyService::updateWantedCodes() {
   std::set<std::uint32_t> codes;
+  std::set<std::uint32_t> extraCodes;
   for (const auto& [name, channel] : channels_) {
-    if (channel->streaming) codes.insert(channel->filter.logCodes().begin(), channel->filter.logCodes().end());
+    if (!channel->streaming) continue;
+    codes.insert(channel->filter.logCodes().begin(), channel->filter.logCodes().end());
+    extraCodes.insert(channel->filter.extraCodes().begin(), channel->filter.extraCodes().end());
   }
   source_->setWantedCodes(codes);
+  if (modemExtraCodes_) modemExtraCodes_->setWantedCodes(extraCodes);
 }
 
 void TelephonyService::produceLive() {

@@ -18,6 +18,7 @@
 
 #include "platform/RunLoop.h"
 #include "platform/SocketMessagePort.h"
+#include "telephonyd/ModemExtraCodes.h"
 #include "telephonyd/PacketPacer.h"
 #include "telephonyd/PacketSource.h"
 
@@ -46,6 +47,10 @@ class TelephonyService {
   void stop();
 
   std::size_t channelCount() const { return channels_.size(); }
+
+  // The extra codes of a real modem, sent beside a live source's packets to
+  // the channels that ask for them. Before start().
+  void setModemExtraCodes(std::unique_ptr<ModemExtraCodes> extraCodes);
 
  private:
   struct Channel {
@@ -80,7 +85,8 @@ class TelephonyService {
   void retryProductionSoon();
   // Takes what a live source has, and sends it.
   void produceLive();
-  // Tells the source which log codes the streaming channels want.
+  // Tells the source which log codes the streaming channels want, and the
+  // modem's extra codes which of theirs.
   void updateWantedCodes();
   void producePaced();
   void pumpAtFullSpeed();
@@ -90,6 +96,7 @@ class TelephonyService {
   RunLoop& runLoop_;
   std::unique_ptr<PacketSource> source_;
   Settings settings_;
+  std::unique_ptr<ModemExtraCodes> modemExtraCodes_;
   std::shared_ptr<SocketLocalPort> servicePort_;
   std::map<std::string, std::unique_ptr<Channel>> channels_;
   // Work queued on the run loop checks this, so that none of it runs after the service is gone.

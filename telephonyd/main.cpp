@@ -17,6 +17,8 @@
 #include "telephonyd/DiagPortSource.h"
 #include "telephonyd/IFXSimulator.h"
 #include "telephonyd/LogCodeSimulator.h"
+#include "telephonyd/ModemExtraCodes.h"
+#include "telephonyd/ModemManagerClient.h"
 #include "telephonyd/ReplaySource.h"
 #include "telephonyd/ServiceOptions.h"
 #include "telephonyd/TelephonyService.h"
@@ -138,6 +140,12 @@ int main(int argc, char** argv) {
   const std::string sourceLine = sourceText(options, *source);
   const double rate = options.replay && options.asFastAsPossible ? 0 : options.rate;
   TelephonyService service(ports, runLoop, std::move(source), {rate, options.packetLimit});
+  if (options.diag) {
+    // On a real modem the SIM files, cell list and PDP contexts come from ModemManager.
+    service.setModemExtraCodes(std::make_unique<ModemExtraCodes>(
+        runLoop, std::make_unique<ModemManagerClient>(runLoop, ModemManagerClient::Settings{options.modem,
+                                                                                             *options.diag})));
+  }
   if (!service.start(error)) {
     const std::string path = ports.socketPath(std::string(kTelephonyServicePortName)).string();
     if (ports.createSocketRemotePort(std::string(kTelephonyServicePortName))) {

@@ -104,6 +104,18 @@ TEST(ServiceOptionsTest, ReplayOptionsThatDoNotFitAreRefusedWithAReason) {
   EXPECT_EQ(parse({"--replay", ""}).error, "--replay needs a file (see --help)");
 }
 
+TEST(ServiceOptionsTest, ModemIsReadWithDiagAndRefusedWithoutIt) {
+  const ParsedOptions parsed =
+      parse({"--diag", "/dev/wwan0qcdm0", "--technology", "Quendra_LTE", "--modem", "356938035643809"});
+  EXPECT_FALSE(parsed.exit) << parsed.error;
+  EXPECT_EQ(parsed.options.modem, "356938035643809");
+  EXPECT_EQ(parse({"--diag", "/dev/ttyUSB0", "--technology", "Quendra_LTE"}).options.modem, "");
+  EXPECT_EQ(parse({"--modem", "0"}).error, "--modem is for --diag (see --help)");
+  EXPECT_EQ(parse({"--diag", "/dev/ttyUSB0", "--technology", "Quendra_LTE", "--modem", ""}).error,
+            "--modem needs an index, an object path or an IMEI (see --help)");
+  EXPECT_NE(serviceUsage().find("--modem MODEM"), std::string::npos);
+}
+
 TEST(ServiceOptionsTest, HelpAndVersionPrintAndExitWithStatus0) {
   const ParsedOptions help = parse({"--help"});
   EXPECT_TRUE(help.exit);
