@@ -43,7 +43,7 @@ const corvane::ProgramUsage kProgram{
     "corvane-demo",
     "Usage: corvane-demo [--technology NAME] [--seed N] [--device-root DIR]\n"
     "       corvane-demo --replay FILE [--technology NAME] [--speed X] [--loop] [--device-root DIR]\n"
-    "       corvane-demo --diag DEVICE --technology NAME [--device-root DIR]\n"
+    "       corvane-demo --diag DEVICE --technology NAME [--modem MODEM] [--device-root DIR]\n"
     "       corvane-demo --tui [OPTIONS]\n",
     "\n"
     "Starts the telephony service with its built-in simulator, playing a\n"
@@ -60,6 +60,9 @@ const corvane::ProgramUsage kProgram{
     "      --speed X          play the capture at X times its pace (default: 1)\n"
     "      --loop             start the capture again after its end\n"
     "      --diag DEVICE      bridge a baseband's diagnostic port (needs --technology)\n"
+    "      --modem MODEM      with --diag: the ModemManager modem that gives the\n"
+    "                         SIM, cell list and PDP contexts, by index, object\n"
+    "                         path or IMEI (default: the one with the port)\n"
     "  -d, --device-root DIR  the phone's file system for the application: it\n"
     "                         holds the marker that offers saving and the\n"
     "                         snapshots (default: $XDG_STATE_HOME/corvane/demo-device,\n"
@@ -185,6 +188,7 @@ int main(int argc, char** argv) {
   std::optional<std::string> speed;
   bool loop = false;
   std::optional<fs::path> diagPort;
+  std::optional<std::string> modem;
   bool terminal = false;
   fs::path root = defaultDeviceRoot();
 
@@ -196,6 +200,7 @@ int main(int argc, char** argv) {
       {"speed", 0, true},
       {"loop", 0, false},
       {"diag", 0, true},
+      {"modem", 0, true},
       {"tui", 0, false},
   };
   const corvane::ParsedCommandLine parsed = corvane::parseCommandLine(
@@ -211,6 +216,7 @@ int main(int argc, char** argv) {
         if (name == "loop") loop = true;
         if (name == "tui") terminal = true;
         if (name == "diag") diagPort = fs::absolute(value);
+        if (name == "modem") modem = value;
         if (name == "seed") {
           char* end = nullptr;
           errno = 0;
@@ -226,6 +232,7 @@ int main(int argc, char** argv) {
   if (!replay && (speed || loop)) {
     return corvane::usageError(kProgram, std::string(speed ? "--speed" : "--loop") + " is for --replay");
   }
+  if (modem && !diagPort) return corvane::usageError(kProgram, "--modem is for --diag");
 
   if (!terminal && !corvane::displayAvailable()) return fail(corvane::noDisplayMessage("corvane-demo"));
   if (terminal && (!::isatty(STDIN_FILENO) || !::isatty(STDOUT_FILENO))) return fail("--tui needs a terminal");
@@ -268,6 +275,7 @@ int main(int argc, char** argv) {
     // The service says what is missing or wrong (a technology, the device).
     serviceArguments.insert(serviceArguments.end(), {"--diag", diagPort->string()});
     if (technologyGiven) serviceArguments.insert(serviceArguments.end(), {"--technology", technology});
+    if (modem) serviceArguments.insert(serviceArguments.end(), {"--modem", *modem});
     if (replay) serviceArguments.insert(serviceArguments.end(), {"--replay", replay->string()});
   } else if (replay) {
     serviceArguments.insert(serviceArguments.end(), {"--replay", replay->string()});

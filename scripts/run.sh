@@ -9,8 +9,9 @@
 #   bash scripts/run.sh --headless [SERVICE-OPTIONS] [ARGS]
 #                                           the service (simulating IFX, or as
 #                                           SERVICE-OPTIONS say: --replay FILE,
-#                                           --diag DEVICE, --technology NAME,
-#                                           --speed X, --loop) and
+#                                           --diag DEVICE, --modem MODEM,
+#                                           --technology NAME, --speed X,
+#                                           --loop) and
 #                                           corvane-monitor for three display
 #                                           updates, as text (ARGS go to
 #                                           corvane-monitor)
@@ -40,8 +41,8 @@ if [ "${1:-}" = "--headless" ]; then
   service_args=()
   while [ $# -gt 0 ]; do
     case "$1" in
-      --replay|--diag|--technology|--speed) [ $# -ge 2 ] || break; service_args+=("$1" "$2"); shift 2 ;;
-      --replay=*|--diag=*|--technology=*|--speed=*|--loop) service_args+=("$1"); shift ;;
+      --replay|--diag|--modem|--technology|--speed) [ $# -ge 2 ] || break; service_args+=("$1" "$2"); shift 2 ;;
+      --replay=*|--diag=*|--modem=*|--technology=*|--speed=*|--loop) service_args+=("$1"); shift ;;
       *) break ;;
     esac
   done

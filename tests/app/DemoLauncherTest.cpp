@@ -17,6 +17,7 @@
 #include <vector>
 
 #include "platform/Version.h"
+#include "support/FakeBaseband.h"
 #include "support/Process.h"
 
 namespace corvane {
@@ -140,6 +141,20 @@ TEST_F(DemoLauncher, RejectsArgumentsItDoesNotKnow) {
   const test::ProcessResult speed = test::runProcess({kDemo, "--speed", "2"});
   EXPECT_EQ(speed.exitCode, 2);
   EXPECT_EQ(speed.err.rfind("corvane-demo: --speed is for --replay\n", 0), 0u) << speed.err;
+  const test::ProcessResult modem = test::runProcess({kDemo, "--modem", "0"});
+  EXPECT_EQ(modem.exitCode, 2);
+  EXPECT_EQ(modem.err.rfind("corvane-demo: --modem is for --diag\n", 0), 0u) << modem.err;
+}
+
+TEST_F(DemoLauncher, ABridgeHandsThePortAndTheModemToTheService) {
+  const test::FakeBaseband baseband(dir_.path(), {});
+  const std::string& port = baseband.link();
+  ASSERT_NO_FATAL_FAILURE(start({"--diag", port, "--technology", "Quendra_LTE", "--modem", "2"}));
+  std::string commandLine = readFile("/proc/" + std::to_string(service_) + "/cmdline");
+  std::replace(commandLine.begin(), commandLine.end(), '\0', ' ');
+  EXPECT_NE(commandLine.find(" --diag " + port + " --technology Quendra_LTE --modem 2"), std::string::npos)
+      << commandLine;
+  EXPECT_EQ(commandLine.find("--seed"), std::string::npos) << commandLine;
 }
 
 TEST_F(DemoLauncher, AReplayHandsTheCaptureToTheServiceByItsWholePath) {
