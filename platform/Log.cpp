@@ -11,17 +11,64 @@
 #include <cstdio>
 #include <cstring>
 #include <iostream>
+#include <utility>
 
 namespace corvane::log {
 
 namespace {
-std::mutex& sinkMutex() {
-  static std::mutex m;
-  return m;
-}
-std::shared_ptr<Sink>& currentSink() {
-  static std::shared_ptr<Sink> s = makeSystemLogSink();
+// The sink all logging goes to, and its generation: a number that setSink
+// raises with every new sink. Each thread keeps the sink it last used, with
+// its generation, and goes back to the mutex only when the generation moved,
+// so a line nobody wants costs an atomic load and the sink's wants(), with
+// no lock taken and no reference counted.
+struct CurrentSink {
+  std::mutex mutex;
+  std::shared_ptr<Sink> sink = makeSystemLogSink();  // guarded by mutex
+  std::atomic<std::uint64_t> generation{1};          // raised under mutex
+};
+CurrentSink& current() {
+  static CurrentSink s;
   return s;
+}
+
+// The calling thread's copy of the current sink. Trivially destructible, so
+// that it can still be read while the thread (or the process) ends: the
+// reference that keeps the sink alive is held by ThreadSinkHold below, which
+// marks the cache as gone when it is destroyed; from then on the thread takes
+// the sink under the mutex for each line.
+struct ThreadSinkCache {
+  std::uint64_t generation;  // 0: nothing cached
+  Sink* sink;
+  bool gone;
+};
+constinit thread_local ThreadSinkCache threadCache{0, nullptr, false};
+
+struct ThreadSinkHold {
+  std::shared_ptr<Sink> sink;
+  ~ThreadSinkHold() { threadCache = {0, nullptr, true}; }
+};
+thread_local ThreadSinkHold threadHold;
+
+// The current sink as the calling thread sees it; `keep` holds it when the
+// thread can no longer cache it.
+Sink* refreshSink(std::shared_ptr<Sink>& keep) {
+  auto& c = current();
+  std::shared_ptr<Sink> replaced;  // released after the mutex: a sink's destructor may log
+  std::lock_guard lock(c.mutex);
+  if (threadCache.gone) {
+    keep = c.sink;
+    return keep.get();
+  }
+  replaced = std::exchange(threadHold.sink, c.sink);
+  threadCache = {c.generation.load(std::memory_order_relaxed), threadHold.sink.get(), false};
+  return threadCache.sink;
+}
+
+// The common path: the cached sink while no new one was set since.
+inline Sink* currentSinkOf(std::shared_ptr<Sink>& keep) {
+  if (threadCache.generation == current().generation.load(std::memory_order_acquire)) [[likely]]
+    return threadCache.sink;
+  return refreshSink(keep);
 }
 
 constexpr const char* kIdent = "corvane";
@@ -52,6 +99,7 @@ __attribute__((format(printf, 1, 0))) std::string vformat(const char* fmt, va_li
   out.resize(static_cast<std::size_t>(n));
   return out;
 }
+
 }  // namespace
 
 const char* systemLogSocket() { return _PATH_LOG; }
@@ -81,18 +129,23 @@ SyslogSink::SyslogSink(std::function<bool()> daemonListens, SteadyClock clock)
 
 bool SyslogSink::daemonPresent() const {
   const auto now = clock_().time_since_epoch().count();
-  if (now < nextCheck_.load(std::memory_order_relaxed)) return present_.load(std::memory_order_relaxed);
-  std::lock_guard lock(checkMutex_);
-  if (now >= nextCheck_.load()) {
-    const bool listens = daemonListens_();
-    // A daemon back (or new): connect at once rather than on the first line.
-    // One that went is left to syslog(3), which connects anew when it returns.
-    if (listens && !present_.load()) openlog(kIdent, kOptions, LOG_USER);
-    present_.store(listens);
-    using Duration = std::chrono::steady_clock::duration;
-    nextCheck_.store(now + std::chrono::duration_cast<Duration>(kDaemonCheckInterval).count());
+  auto due = nextCheck_.load(std::memory_order_relaxed);
+  if (now < due) return present_.load(std::memory_order_acquire);
+  // The check is due: the thread that moves the next one a second on makes
+  // it; the others answer from the last one meanwhile.
+  using Duration = std::chrono::steady_clock::duration;
+  const auto next = now + std::chrono::duration_cast<Duration>(kDaemonCheckInterval).count();
+  if (!nextCheck_.compare_exchange_strong(due, next, std::memory_order_relaxed)) {
+    return present_.load(std::memory_order_acquire);
   }
-  return present_.load();
+  // Keeps a check that takes long apart from the next one.
+  std::lock_guard lock(checkMutex_);
+  const bool listens = daemonListens_();
+  // A daemon back (or new): connect at once rather than on the first line.
+  // One that went is left to syslog(3), which connects anew when it returns.
+  if (listens && !present_.load(std::memory_order_relaxed)) openlog(kIdent, kOptions, LOG_USER);
+  present_.store(listens, std::memory_order_release);
+  return listens;
 }
 
 void SyslogSink::write(int priority, std::string_view text) {
@@ -102,8 +155,10 @@ void SyslogSink::write(int priority, std::string_view text) {
 
 bool SyslogSink::wants(int priority) const {
   if (priority == kMessage) return false;
-  // setlogmask(0) reads the mask without changing it.
-  return (setlogmask(0) & LOG_MASK(LOG_PRI(priority))) != 0 && daemonPresent();
+  // Whether a daemon listens is known from atomics; setlogmask(0), which reads
+  // the mask without changing it but under the C library's lock, is asked
+  // only then.
+  return daemonPresent() && (setlogmask(0) & LOG_MASK(LOG_PRI(priority))) != 0;
 }
 
 RepeatCollapsingSink::RepeatCollapsingSink(std::shared_ptr<Sink> next, SteadyClock clock)
@@ -209,13 +264,27 @@ void CapturingSink::clear() {
 }
 
 void setSink(std::shared_ptr<Sink> s) {
-  std::lock_guard lock(sinkMutex());
-  currentSink() = std::move(s);
+  auto& c = current();
+  std::shared_ptr<Sink> previous;
+  std::shared_ptr<Sink> cached;
+  {
+    std::lock_guard lock(c.mutex);
+    previous = std::exchange(c.sink, std::move(s));
+    c.generation.fetch_add(1, std::memory_order_release);
+    // This thread lets go of the old sink at once: a program that replaces
+    // its sink sees the old one go (and write what it held back) here.
+    if (!threadCache.gone) {
+      cached = std::move(threadHold.sink);
+      threadCache = {0, nullptr, false};
+    }
+  }
+  // Released outside the mutex, since a sink's destructor may log.
 }
 
 std::shared_ptr<Sink> sink() {
-  std::lock_guard lock(sinkMutex());
-  return currentSink();
+  auto& c = current();
+  std::lock_guard lock(c.mutex);
+  return c.sink;
 }
 
 void flush() {
@@ -223,16 +292,19 @@ void flush() {
 }
 
 bool wants(int priority) {
-  const auto s = sink();
+  std::shared_ptr<Sink> keep;
+  Sink* s = currentSinkOf(keep);
   return s && s->wants(priority);
 }
 
 void write(int priority, std::string_view text) {
-  if (auto s = sink(); s && s->wants(priority)) s->write(priority, text);
+  std::shared_ptr<Sink> keep;
+  if (Sink* s = currentSinkOf(keep); s && s->wants(priority)) s->write(priority, text);
 }
 
 void printf(int priority, const char* fmt, ...) {
-  const auto s = sink();
+  std::shared_ptr<Sink> keep;
+  Sink* s = currentSinkOf(keep);
   if (!s || !s->wants(priority)) return;
   va_list args;
   va_start(args, fmt);
