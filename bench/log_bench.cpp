@@ -9,6 +9,9 @@
 //                  and closes a socket for every line.
 // Each runs with distinct lines ("Distinct": a packet number in every line)
 // and with one line repeated ("Repeated").
+//   BM_LogPrintf/Unwanted  a line no sink wants, as a decoder's per-packet
+//                  traces are when nobody reads them: what log::printf costs
+//                  before it learns that, with nothing formatted.
 //
 // The bench plays the daemon itself, on /dev/log of a /dev of its own (a
 // private mount namespace over a fresh tmpfs), so that the machine's own log
@@ -129,6 +132,25 @@ void logLines(benchmark::State& state, Daemon daemon, Sink sinkKind, Lines lines
   }
 }
 
+// Wants no line, as corvane-decode -q's sink.
+class WantsNothingSink final : public log::Sink {
+ public:
+  void write(int, std::string_view) override {}
+  bool wants(int) const override { return false; }
+};
+
+void unwantedLine(benchmark::State& state) {
+  const auto previous = log::sink();
+  log::setSink(std::make_shared<WantsNothingSink>());
+  int packet = 0;
+  for (auto _ : state) {
+    log::printf(log::kWarning, "Number of neighboring cells being reported: %d", ++packet);
+  }
+  log::setSink(previous);
+  state.counters["lines_per_second"] =
+      benchmark::Counter(static_cast<double>(state.iterations()), benchmark::Counter::kIsRate);
+}
+
 // A /dev of this process's own, empty, where /dev/log can be made and removed
 // freely. Must run before any thread starts.
 bool enterPrivateDev() {
@@ -155,6 +177,7 @@ int main(int argc, char** argv) {
       }
     }
   }
+  benchmark::RegisterBenchmark("BM_LogPrintf/Unwanted", unwantedLine);
   benchmark::Initialize(&argc, argv);
   if (benchmark::ReportUnrecognizedArguments(argc, argv)) return 1;
   benchmark::RunSpecifiedBenchmarks();

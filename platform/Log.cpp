@@ -24,12 +24,13 @@ namespace {
 struct CurrentSink {
   std::mutex mutex;
   std::shared_ptr<Sink> sink = makeSystemLogSink();  // guarded by mutex
-  std::atomic<std::uint64_t> generation{1};          // raised under mutex
 };
 CurrentSink& current() {
   static CurrentSink s;
   return s;
 }
+// Raised under CurrentSink::mutex; never 0.
+constinit std::atomic<std::uint64_t> sinkGeneration{1};
 
 // The calling thread's copy of the current sink. Trivially destructible, so
 // that it can still be read while the thread (or the process) ends: the
@@ -60,15 +61,18 @@ Sink* refreshSink(std::shared_ptr<Sink>& keep) {
     return keep.get();
   }
   replaced = std::exchange(threadHold.sink, c.sink);
-  threadCache = {c.generation.load(std::memory_order_relaxed), threadHold.sink.get(), false};
+  threadCache = {sinkGeneration.load(std::memory_order_relaxed), threadHold.sink.get(), false};
   return threadCache.sink;
 }
 
-// The common path: the cached sink while no new one was set since.
-inline Sink* currentSinkOf(std::shared_ptr<Sink>& keep) {
-  if (threadCache.generation == current().generation.load(std::memory_order_acquire)) [[likely]]
-    return threadCache.sink;
-  return refreshSink(keep);
+// Hands `use` the current sink (null if none). The common path: the copy
+// this thread keeps, while no new sink was set since.
+template <class Use>
+inline auto withSink(Use&& use) {
+  if (threadCache.generation == sinkGeneration.load(std::memory_order_acquire)) [[likely]]
+    return use(threadCache.sink);
+  std::shared_ptr<Sink> keep;
+  return use(refreshSink(keep));
 }
 
 constexpr const char* kIdent = "corvane";
@@ -270,7 +274,7 @@ void setSink(std::shared_ptr<Sink> s) {
   {
     std::lock_guard lock(c.mutex);
     previous = std::exchange(c.sink, std::move(s));
-    c.generation.fetch_add(1, std::memory_order_release);
+    sinkGeneration.fetch_add(1, std::memory_order_release);
     // This thread lets go of the old sink at once: a program that replaces
     // its sink sees the old one go (and write what it held back) here.
     if (!threadCache.gone) {
@@ -292,25 +296,24 @@ void flush() {
 }
 
 bool wants(int priority) {
-  std::shared_ptr<Sink> keep;
-  Sink* s = currentSinkOf(keep);
-  return s && s->wants(priority);
+  return withSink([priority](Sink* s) { return s && s->wants(priority); });
 }
 
 void write(int priority, std::string_view text) {
-  std::shared_ptr<Sink> keep;
-  if (Sink* s = currentSinkOf(keep); s && s->wants(priority)) s->write(priority, text);
+  withSink([priority, text](Sink* s) {
+    if (s && s->wants(priority)) s->write(priority, text);
+  });
 }
 
 void printf(int priority, const char* fmt, ...) {
-  std::shared_ptr<Sink> keep;
-  Sink* s = currentSinkOf(keep);
-  if (!s || !s->wants(priority)) return;
   va_list args;
   va_start(args, fmt);
-  std::string text = vformat(fmt, args);
+  withSink([priority, fmt, &args](Sink* s) {
+    if (!s || !s->wants(priority)) return;
+    const std::string text = vformat(fmt, args);
+    s->write(priority, text);
+  });
   va_end(args);
-  s->write(priority, text);
 }
 
 std::string format(const char* fmt, ...) {
