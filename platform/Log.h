@@ -162,7 +162,7 @@ class CapturingSink final : public Sink {
   std::vector<Line> lines_;
 };
 
-// The sink all logging goes to; makeSystemLogSink() until replaced.
+// The sink all logging goes to, makeSystemLogSink() until replaced; other threads drop the old at their next line.
 void setSink(std::shared_ptr<Sink> sink);
 std::shared_ptr<Sink> sink();
 // Flushes the current sink; programs call it as they end.

@@ -14,17 +14,21 @@
 namespace corvane {
 namespace {
 
-// Counts the workers' lines it takes; wants no notice.
+// Counts the workers' lines and the swapping thread's ones it takes; wants
+// no notice.
 class CountingSink final : public log::Sink {
  public:
   void write(int priority, std::string_view text) override {
     if (priority == log::kWarning && text.rfind("worker ", 0) == 0) workerLines_.fetch_add(1);
+    if (text == "swapped") swappedLines_.fetch_add(1);
   }
   bool wants(int priority) const override { return priority != log::kNotice; }
   std::uint64_t workerLines() const { return workerLines_.load(); }
+  std::uint64_t swappedLines() const { return swappedLines_.load(); }
 
  private:
   std::atomic<std::uint64_t> workerLines_{0};
+  std::atomic<std::uint64_t> swappedLines_{0};
 };
 
 TEST(LogThreads, EveryLineReachesOneSinkWhileAnotherThreadSwapsThem) {
@@ -65,20 +69,19 @@ TEST(LogThreads, EveryLineReachesOneSinkWhileAnotherThreadSwapsThem) {
     }
     log::setSink(next);
     // What this thread writes after the swap goes to the new sink, at once.
-    log::write(log::kWarning, "worker swapping");
+    log::write(log::kWarning, "swapped");
     if (i % 2 == 0) {
-      ASSERT_EQ(counting.back()->workerLines(), 1u) << "swap " << i;
+      EXPECT_EQ(counting.back()->swappedLines(), 1u) << "swap " << i;
     } else {
-      ASSERT_EQ(capturing.back()->count("worker swapping"), 1u) << "swap " << i;
+      EXPECT_EQ(capturing.back()->count("swapped"), 1u) << "swap " << i;
     }
   }
   stopping.store(true);
   for (auto& t : workers) t.join();
   log::setSink(previous);
 
-  // Each line the workers wrote, and the swapping thread's one per swap,
-  // reached exactly one sink.
-  std::uint64_t total = 300;
+  // Each line the workers wrote reached exactly one sink.
+  std::uint64_t total = 0;
   for (const auto n : written) total += n;
   std::uint64_t seen = outer->workerLines();
   for (const auto& s : counting) seen += s->workerLines();
@@ -87,7 +90,7 @@ TEST(LogThreads, EveryLineReachesOneSinkWhileAnotherThreadSwapsThem) {
       seen += line.priority == log::kWarning && line.text.rfind("worker ", 0) == 0 ? 1 : 0;
     }
   }
-  EXPECT_GT(total, 300u);
+  EXPECT_GT(total, 0u);
   EXPECT_EQ(seen, total);
 }
 
@@ -103,10 +106,10 @@ TEST(LogThreads, AScopedCaptureTakesThisThreadsLinesWhileOthersLog) {
     {
       log::ScopedCapture capture;
       log::write(log::kError, "inside");
-      ASSERT_EQ(capture.sink().count("inside"), 1u) << "capture " << i;
+      EXPECT_EQ(capture.sink().count("inside"), 1u) << "capture " << i;
     }
     log::write(log::kError, "outside");
-    ASSERT_EQ(outer->count("outside"), static_cast<std::size_t>(i) + 1) << "capture " << i;
+    EXPECT_EQ(outer->count("outside"), static_cast<std::size_t>(i) + 1) << "capture " << i;
   }
   stopping.store(true);
   worker.join();
