@@ -9,13 +9,13 @@
 
 #include <chrono>
 #include <filesystem>
-#include <fstream>
-#include <functional>
+#include <optional>
 #include <sstream>
 #include <string>
 #include <thread>
 #include <vector>
 
+#include "MockModemManager.h"
 #include "support/FakeBaseband.h"
 #include "support/JsonTree.h"
 #include "support/Process.h"
@@ -24,81 +24,29 @@ namespace corvane {
 namespace {
 
 using namespace std::chrono_literals;
-using Clock = std::chrono::steady_clock;
+using test::Background;
+using test::fileText;
+using test::waitUntil;
 
 const std::string kService = CORVANE_TELEPHONYD_BINARY;
 const std::string kMonitor = CORVANE_MONITOR_BINARY;
-const std::string kDbusDaemon = CORVANE_DBUS_DAEMON;
-const std::string kPython = CORVANE_DBUSMOCK_PYTHON;
-const std::string kMockScript = std::string(CORVANE_SOURCE_DIR) + "/tests/telephonyd/mock_modemmanager.py";
-
-std::string fileText(const std::string& path) {
-  std::ifstream in(path);
-  std::stringstream text;
-  text << in.rdbuf();
-  return text.str();
-}
-
-bool waitUntil(const std::function<bool()>& done, std::chrono::milliseconds limit) {
-  const auto giveUp = Clock::now() + limit;
-  while (!done()) {
-    if (Clock::now() > giveUp) return false;
-    std::this_thread::sleep_for(20ms);
-  }
-  return true;
-}
-
-// A process of the test, stopped with SIGTERM at the end.
-class Background {
- public:
-  Background() = default;
-  Background(const std::vector<std::string>& argv, const std::vector<std::string>& environment,
-             const std::string& log)
-      : pid_(test::startProcess(argv, environment, log)) {}
-  ~Background() { stop(); }
-  Background(Background&& other) noexcept : pid_(std::exchange(other.pid_, -1)) {}
-  Background& operator=(Background&& other) noexcept {
-    stop();
-    pid_ = std::exchange(other.pid_, -1);
-    return *this;
-  }
-  int stop() {
-    if (pid_ <= 0) return -1;
-    const int status = test::stopProcess(std::exchange(pid_, -1), SIGTERM);
-    return status;
-  }
-
- private:
-  int pid_ = -1;
-};
 
 class ModemManagerTest : public ::testing::Test {
  protected:
   void SetUp() override {
-    if (!std::filesystem::exists(kDbusDaemon)) GTEST_SKIP() << "dbus-daemon is not installed (scripts/deps.sh)";
-    if (test::runProcess({kPython, "-c", "import dbusmock"}).exitCode != 0) {
-      GTEST_SKIP() << kPython << " has no dbusmock module: python3-dbusmock is not installed (scripts/deps.sh)";
-    }
-    const std::string socket = files_.path() + "/bus";
-    busAddress_ = "unix:path=" + socket;
-    bus_ = Background({kDbusDaemon, "--session", "--nofork", "--nopidfile", "--address=" + busAddress_}, {},
-                      files_.path() + "/bus.log");
-    ASSERT_TRUE(waitUntil([&] { return std::filesystem::exists(socket); }, 5000ms)) << fileText(files_.path() + "/bus.log");
+    if (const std::string why = test::MockModemManagerBus::missing(); !why.empty()) GTEST_SKIP() << why;
+    bus_.emplace(files_.path());
+    ASSERT_TRUE(bus_->ready()) << bus_->busLog();
     std::filesystem::create_directory(runtime());
     std::filesystem::permissions(runtime(), std::filesystem::perms::owner_all);
   }
 
   std::string runtime() const { return files_.path() + "/runtime"; }
-  std::vector<std::string> environment() const {
-    return {"DBUS_SYSTEM_BUS_ADDRESS=" + busAddress_, "CORVANE_RUNTIME_DIR=" + runtime()};
-  }
+  std::vector<std::string> environment() const { return {bus_->systemBusVariable(), "CORVANE_RUNTIME_DIR=" + runtime()}; }
 
-  void startModemManager(const std::string& parameters = "{}") {
-    modemManager_ = Background({kPython, "-m", "dbusmock", "--system", "-t", kMockScript, "-p", parameters},
-                               environment(), files_.path() + "/modemmanager.log");
-  }
+  void startModemManager(const std::string& parameters = "{}") { bus_->startModemManager(parameters); }
   void control(const std::string& command) {
-    const auto result = test::runProcess({kPython, kMockScript, command}, "", environment());
+    const auto result = bus_->control(command);
     ASSERT_EQ(result.exitCode, 0) << result.err;
   }
 
@@ -149,9 +97,7 @@ class ModemManagerTest : public ::testing::Test {
   }
 
   test::TemporaryDirectory files_;
-  std::string busAddress_;
-  Background bus_;
-  Background modemManager_;
+  std::optional<test::MockModemManagerBus> bus_;
   Background service_;
   Background monitor_;
 };
