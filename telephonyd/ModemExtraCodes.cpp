@@ -26,15 +26,12 @@ constexpr ModemClient::Part kParts[] = {ModemClient::Part::Sim, ModemClient::Par
 
 ModemExtraCodes::ModemExtraCodes(RunLoop& loop, std::unique_ptr<ModemClient> client)
     : loop_(loop), client_(std::move(client)) {
-  std::weak_ptr<bool> alive = alive_;
-  client_->setChangeHandler([this, alive](ModemClient::Part part) {
-    if (!alive.expired()) onChange(part);
-  });
+  // The client is this object's own, and the handler goes before it does.
+  client_->setChangeHandler([this](ModemClient::Part part) { onChange(part); });
 }
 
 ModemExtraCodes::~ModemExtraCodes() {
   if (timer_) loop_.cancel(timer_);
-  *alive_ = false;
   client_->setChangeHandler(nullptr);
 }
 

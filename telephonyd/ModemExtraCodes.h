@@ -50,6 +50,7 @@ class ModemExtraCodes {
   std::set<std::uint32_t> wanted_;
   RunLoop::Handle timer_ = 0;
   std::uint64_t ticks_ = 0;
+  // Work queued on the run loop holds a weak copy: it does nothing once this is gone.
   std::shared_ptr<bool> alive_ = std::make_shared<bool>(true);
 };
 

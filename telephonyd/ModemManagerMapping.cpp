@@ -8,6 +8,7 @@
 #include <span>
 
 #include "platform/CellMonitor.h"
+#include "telephonyd/SimFileCoding.h"
 
 namespace corvane::telephonyd::modem {
 
@@ -114,13 +115,6 @@ struct IpTypeRow {
 constexpr IpTypeRow kIpTypes[] = {
     {kIpFamilyIpv4, "IPv4"}, {kIpFamilyIpv6, "IPv6"}, {kIpFamilyIpv4v6, "IPv4v6"}, {kIpFamilyNonIp, "Non-IP"}};
 
-std::string hex(std::uint64_t value, int digits) {
-  static constexpr char kDigits[] = "0123456789ABCDEF";
-  std::string out;
-  for (int i = digits - 1; i >= 0; --i) out += kDigits[(value >> (4 * i)) & 0xF];
-  return out;
-}
-
 const std::string* text(const Field& field) { return std::get_if<std::string>(&field); }
 
 std::optional<double> number(const Field& field) {
@@ -213,17 +207,6 @@ std::string_view ipTypeText(std::uint32_t family) {
 
 }  // namespace
 
-std::optional<std::string> plmnIdentity(std::string_view operatorCode) {
-  if ((operatorCode.size() != 5 && operatorCode.size() != 6) || !allDigits(operatorCode)) return std::nullopt;
-  auto digit = [&](std::size_t i) -> std::uint64_t {
-    return i < operatorCode.size() ? static_cast<std::uint64_t>(operatorCode[i] - '0') : 0xF;
-  };
-  // MCC 1 2 3, MNC 1 2 [3]: bytes MCC2|MCC1, MNC3|MCC3, MNC2|MNC1.
-  const std::uint64_t coded = (digit(1) << 4 | digit(0)) << 16 | (digit(5) << 4 | digit(2)) << 8 |
-                              (digit(4) << 4 | digit(3));
-  return hex(coded, 6);
-}
-
 std::optional<int> lteBandOfEarfcn(std::uint64_t earfcn) {
   for (const LteBandRange& range : kLteBands) {
     if (earfcn >= range.first && earfcn <= range.last) return range.band;
@@ -251,7 +234,7 @@ Dictionary simFiles(const SimState& sim) {
     for (const AccessTechnologyRow& row : kAccessTechnologies) {
       if (network.accessTechnologies & row.modemBits) access |= row.selectorBits;
     }
-    selector += *identity + hex(access, 4);
+    selector += *identity + hexBytes(access, 2);
   }
   if (!selector.empty()) files.set("kSimFile_OPLMNAcT", Value(selector));
   return files;

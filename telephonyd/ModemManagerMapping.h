@@ -115,11 +115,6 @@ struct ModemCandidate {
 std::optional<std::size_t> chooseModem(const std::vector<ModemCandidate>& modems, std::string_view choice,
                                        const std::vector<std::string>& diagPorts, std::string& why);
 
-// The PLMN identity of an operator code (5 or 6 digits) as EF contents are
-// coded (3 bytes, BCD, digits swapped, F filling a 2-digit MNC), as hex text;
-// nothing for another text.
-std::optional<std::string> plmnIdentity(std::string_view operatorCode);
-
 // The LTE band of a downlink E-ARFCN; nothing for one outside the bands known.
 std::optional<int> lteBandOfEarfcn(std::uint64_t earfcn);
 

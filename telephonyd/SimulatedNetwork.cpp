@@ -3,10 +3,12 @@
 #include <algorithm>
 #include <array>
 #include <cmath>
+#include <cstdio>
 #include <stdexcept>
 
 #include "platform/CellMonitor.h"
 #include "platform/LogChannelTechnology.h"
+#include "telephonyd/SimFileCoding.h"
 
 namespace corvane::telephonyd {
 
@@ -152,13 +154,6 @@ std::string_view accessValue(SimulatedNetwork::Access access) {
   return {};
 }
 
-std::string hex(std::uint64_t value, int bytes) {
-  static const char* digits = "0123456789ABCDEF";
-  std::string out;
-  for (int i = bytes * 2 - 1; i >= 0; --i) out += digits[(value >> (4 * i)) & 0xF];
-  return out;
-}
-
 std::string digitString(SeededRandom& random, int count) {
   std::string out;
   for (int i = 0; i < count; ++i) out += static_cast<char>('0' + random.uniform(0, 9));
@@ -177,12 +172,11 @@ char luhnCheckDigit(std::string_view digits) {
   return static_cast<char>('0' + (10 - sum % 10) % 10);
 }
 
-// The PLMN identity as the SIM stores it: MCC and MNC digits in swapped BCD,
-// with F for the missing third MNC digit.
+// The PLMN identity as the SIM stores it, of a 3-digit MCC and a 2-digit MNC.
 std::string plmnIdentity(int mcc, int mnc) {
-  const int d1 = mcc / 100, d2 = mcc / 10 % 10, d3 = mcc % 10;
-  const int m1 = mnc / 10 % 10, m2 = mnc % 10;
-  return hex(static_cast<std::uint64_t>((d2 << 4 | d1) << 16 | (0xF << 4 | d3) << 8 | (m2 << 4 | m1)), 3);
+  char digits[16];
+  std::snprintf(digits, sizeof digits, "%03d%02d", mcc, mnc);
+  return telephonyd::plmnIdentity(digits).value_or("FFFFFF");
 }
 
 // A network name element of EF-PNN: tag, length, coding (GSM default alphabet,
@@ -195,16 +189,16 @@ std::string networkNameElement(int tag, std::string_view name) {
     pending |= static_cast<std::uint32_t>(c & 0x7F) << bits;
     bits += 7;
     while (bits >= 8) {
-      packed += hex(pending & 0xFF, 1);
+      packed += hexBytes(pending & 0xFF, 1);
       pending >>= 8;
       bits -= 8;
     }
   }
-  if (bits > 0) packed += hex(pending & 0xFF, 1);
+  if (bits > 0) packed += hexBytes(pending & 0xFF, 1);
   const int spareBits = bits > 0 ? 8 - bits : 0;
   const auto octets = static_cast<std::uint64_t>(packed.size() / 2);
   const auto coding = 0x80u | static_cast<unsigned>(spareBits);
-  return hex(static_cast<std::uint64_t>(tag), 1) + hex(octets + 1, 1) + hex(coding, 1) + packed;
+  return hexBytes(static_cast<std::uint64_t>(tag), 1) + hexBytes(octets + 1, 1) + hexBytes(coding, 1) + packed;
 }
 
 std::string number(long long value) { return std::to_string(value); }
@@ -620,9 +614,9 @@ void SimulatedNetwork::step() {
   if (random_.oneIn(kImsToggleOneIn)) {
     imsActive_ = !imsActive_;
     if (imsActive_) {
-      imsAddress_ = "2001:db8:" + hex(static_cast<std::uint64_t>(random_.uniform(0, 0xFFFF)), 2) + ":" +
-                    hex(static_cast<std::uint64_t>(random_.uniform(0, 0xFFFF)), 2) + "::" +
-                    hex(static_cast<std::uint64_t>(random_.uniform(1, 0xFFFF)), 2);
+      imsAddress_ = "2001:db8:" + hexBytes(static_cast<std::uint64_t>(random_.uniform(0, 0xFFFF)), 2) + ":" +
+                    hexBytes(static_cast<std::uint64_t>(random_.uniform(0, 0xFFFF)), 2) + "::" +
+                    hexBytes(static_cast<std::uint64_t>(random_.uniform(1, 0xFFFF)), 2);
     }
     ++pdpGeneration_;
   }
@@ -710,7 +704,7 @@ Value SimulatedNetwork::simFiles() const {
   // contents; numbers are shown as dialled.
   const Cell& serving = cells_[serving_];
   const std::string home = plmnIdentity(kMobileCountryCode, kMobileNetworkCode);
-  const std::string locationArea = home + hex(static_cast<std::uint64_t>(serving.areaCode), 2);
+  const std::string locationArea = home + hexBytes(static_cast<std::uint64_t>(serving.areaCode), 2);
   const int accessClass = imsi_.back() - '0';
   const std::string unusedPlmn = "FFFFFF";
 
@@ -720,11 +714,11 @@ Value SimulatedNetwork::simFiles() const {
   files.set("kSimFile_MBDN", Value(mailbox_));
   files.set("kSimFile_HPPLMN", Value("05"));  // search every 5 x 6 minutes
   // TMSI, LAI, TMSI time (none), update status (updated).
-  files.set("kSimFile_LOCI", Value(hex(tmsi_, 4) + locationArea + "FF" + "00"));
+  files.set("kSimFile_LOCI", Value(hexBytes(tmsi_, 4) + locationArea + "FF" + "00"));
   // P-TMSI, its signature, RAI, routing area update status (updated).
-  files.set("kSimFile_PSLOCI", Value(hex(ptmsi_, 4) + hex(ptmsiSignature_, 3) + locationArea +
-                                     hex(static_cast<std::uint64_t>(routingAreaCode_), 1) + "00"));
-  files.set("kSimFile_ACC", Value(hex(1u << accessClass, 2)));  // the class is the IMSI's last digit
+  files.set("kSimFile_PSLOCI", Value(hexBytes(ptmsi_, 4) + hexBytes(ptmsiSignature_, 3) + locationArea +
+                                     hexBytes(static_cast<std::uint64_t>(routingAreaCode_), 1) + "00"));
+  files.set("kSimFile_ACC", Value(hexBytes(1u << accessClass, 2)));  // the class is the IMSI's last digit
   files.set("kSimFile_AD", Value("00000002"));                 // normal operation, 2-digit MNC
   files.set("kSimFile_FPLMN", Value(plmnIdentity(kMobileCountryCode, 2) + unusedPlmn + unusedPlmn + unusedPlmn));
   files.set("kSimFile_AHPLMN", Value(home));

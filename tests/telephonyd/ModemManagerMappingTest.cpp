@@ -5,6 +5,7 @@
 #include <gtest/gtest.h>
 
 #include "platform/CellMonitor.h"
+#include "telephonyd/SimFileCoding.h"
 
 namespace corvane::telephonyd::modem {
 namespace {
